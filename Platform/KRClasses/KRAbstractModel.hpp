@@ -1,0 +1,50 @@
+#pragma once
+
+#include <functional>
+#include <memory>
+#include <mutex>
+#include <string>
+#include <vector>
+
+#include "KRFoundation/KRObject.hpp"
+
+// Base of the model classes: a list of weakly held observers notified in registration order, and
+// doors to the main run loop.
+//
+// Observers are KRObjects that implement an observer interface (an abstract class whose methods have
+// empty default bodies). A notification names the interface method; each registered observer that
+// implements the interface gets the call, an observer that is gone or no longer registered is skipped.
+class KRAbstractModel : public KRObject {
+ public:
+  // Registers an observer once; adding it again changes nothing.
+  void addListener(const std::shared_ptr<KRObject>& listener);
+  void removeListener(const std::shared_ptr<KRObject>& listener);
+  bool hasListener(const std::shared_ptr<KRObject>& listener) const;
+  // The live observers in registration order.
+  std::vector<std::shared_ptr<KRObject>> listeners() const;
+
+  // Calls `selector` with the arguments on every observer that implements `Protocol`. Observers may
+  // add or remove observers (themselves included) while being notified.
+  template <class Protocol, class... Params, class... Args>
+  void notifyObserversWithSelector(void (Protocol::*selector)(Params...), Args&&... args) {
+    for (const auto& listener : listeners()) {
+      if (!hasListener(listener)) continue;
+      if (auto observer = std::dynamic_pointer_cast<Protocol>(listener)) ((*observer).*selector)(args...);
+    }
+  }
+
+  // Runs the block in a later iteration of the main run loop, in one of the modes (default: the default mode).
+  void performOnNextRunLoopIterationBlock(std::function<void()> block, const std::vector<std::string>& modes);
+  void performOnNextRunLoopIterationBlock(std::function<void()> block);
+  // Runs the block on the main thread: inline when called there, otherwise posted and waited for.
+  void performMainThreadBlock(const std::function<void()>& block);
+  // Posts the block to the main run loop; it runs later even when called on the main thread.
+  void asyncPerformMainThreadBlock(std::function<void()> block);
+
+ protected:
+  KRAbstractModel() = default;
+
+ private:
+  mutable std::mutex mutex_;
+  std::vector<std::weak_ptr<KRObject>> listeners_;
+};

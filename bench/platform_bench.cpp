@@ -7,7 +7,8 @@
 #include "KRFoundation/KRValue.hpp"
 
 static void BM_DispatcherWaitRoundTrip(benchmark::State& state) {
-  auto dispatcher = KRBlockDispatcher::initWithDispatchQueue(KRDispatchQueue::serialQueue("bench.dispatcher"));
+  auto dispatcher =
+      KRBlockDispatcher::initWithDispatchQueue(KRDispatchQueue::serialQueue("bench.dispatcher"));
   long counter = 0;
   for (auto _ : state) dispatcher->performBlockAndWait([&counter] { ++counter; });
   benchmark::DoNotOptimize(counter);
@@ -32,7 +33,8 @@ BENCHMARK(BM_WideStringRoundTrip);
 static void BM_ParallelApply(benchmark::State& state) {
   std::vector<double> values(100000, 1.5);
   for (auto _ : state) {
-    KRConcurrentQueue::globalQueue().apply(values.size(), [&values](size_t i) { values[i] = values[i] * 1.0001; });
+    KRConcurrentQueue::globalQueue().apply(values.size(),
+                                           [&values](size_t i) { values[i] = values[i] * 1.0001; });
   }
   benchmark::DoNotOptimize(values.data());
 }

@@ -26,7 +26,8 @@ void KRAbstractModel::addListener(const std::shared_ptr<KRObject>& listener) {
 
 void KRAbstractModel::removeListener(const std::shared_ptr<KRObject>& listener) {
   std::lock_guard lock(mutex_);
-  std::erase_if(listeners_, [&](const auto& entry) { return entry.expired() || refersTo(entry, listener.get()); });
+  std::erase_if(listeners_,
+                [&](const auto& entry) { return entry.expired() || refersTo(entry, listener.get()); });
 }
 
 bool KRAbstractModel::hasListener(const std::shared_ptr<KRObject>& listener) const {

@@ -33,7 +33,8 @@ class KRAbstractModel : public KRObject {
     }
   }
 
-  // Runs the block in a later iteration of the main run loop, in one of the modes (default: the default mode).
+  // Runs the block in a later iteration of the main run loop, in one of the modes (default: the default
+  // mode).
   void performOnNextRunLoopIterationBlock(std::function<void()> block, const std::vector<std::string>& modes);
   void performOnNextRunLoopIterationBlock(std::function<void()> block);
   // Runs the block on the main thread: inline when called there, otherwise posted and waited for.

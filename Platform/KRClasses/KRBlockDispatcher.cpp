@@ -4,7 +4,8 @@
 
 #include "KRServices/KRLog.hpp"
 
-std::shared_ptr<KRBlockDispatcher> KRBlockDispatcher::initWithDispatchQueue(std::shared_ptr<KRDispatchQueue> queue) {
+std::shared_ptr<KRBlockDispatcher> KRBlockDispatcher::initWithDispatchQueue(
+    std::shared_ptr<KRDispatchQueue> queue) {
   if (!queue) return nullptr;
   return std::shared_ptr<KRBlockDispatcher>(new KRBlockDispatcher(std::move(queue)));
 }

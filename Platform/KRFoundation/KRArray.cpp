@@ -5,7 +5,8 @@
 #include "KRFoundation/KRException.hpp"
 #include "KRFoundation/KRHashing.hpp"
 
-KRArray::KRArray(std::vector<KRValue> values) : values_(std::make_shared<const std::vector<KRValue>>(std::move(values))) {}
+KRArray::KRArray(std::vector<KRValue> values)
+    : values_(std::make_shared<const std::vector<KRValue>>(std::move(values))) {}
 
 KRArray::KRArray(std::initializer_list<KRValue> values) : KRArray(std::vector<KRValue>(values)) {}
 
@@ -20,8 +21,9 @@ const std::vector<KRValue>& KRArray::values() const {
 
 const KRValue& KRArray::objectAtIndex(size_t index) const {
   if (index >= count()) {
-    KRException::raise(KRException::NSRangeException, "index " + std::to_string(index) + " beyond bounds [0 .. " +
-                                                           std::to_string(count()) + ")");
+    KRException::raise(
+        KRException::NSRangeException,
+        "index " + std::to_string(index) + " beyond bounds [0 .. " + std::to_string(count()) + ")");
   }
   return (*values_)[index];
 }

@@ -27,7 +27,9 @@ KRDate KRDate::distantFuture() {
 
 double KRDate::timeIntervalSince1970() const { return seconds_ ? *seconds_ : 0.0; }
 
-double KRDate::timeIntervalSinceNow() const { return timeIntervalSince1970() - date().timeIntervalSince1970(); }
+double KRDate::timeIntervalSinceNow() const {
+  return timeIntervalSince1970() - date().timeIntervalSince1970();
+}
 
 std::string KRDate::description() const {
   if (!seconds_) return "(null)";

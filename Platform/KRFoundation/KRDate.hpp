@@ -9,7 +9,7 @@
 // Immutable, nullable point in time, in seconds since 1970-01-01 00:00:00 UTC.
 class KRDate {
  public:
-  KRDate() = default;  // nil
+  KRDate() = default;    // nil
   static KRDate date();  // now
   static KRDate dateWithTimeIntervalSince1970(double seconds);
   static KRDate dateWithTimeIntervalSinceNow(double seconds);

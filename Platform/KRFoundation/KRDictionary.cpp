@@ -33,7 +33,8 @@ KRDictionary::KRDictionary(const std::vector<Entry>& entries) {
   storage_ = std::move(storage);
 }
 
-KRDictionary::KRDictionary(std::initializer_list<Entry> entries) : KRDictionary(std::vector<Entry>(entries)) {}
+KRDictionary::KRDictionary(std::initializer_list<Entry> entries)
+    : KRDictionary(std::vector<Entry>(entries)) {}
 
 KRDictionary KRDictionary::dictionary() { return KRDictionary(std::vector<Entry>{}); }
 

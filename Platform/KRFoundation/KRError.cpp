@@ -10,11 +10,11 @@ std::shared_ptr<KRError> KRError::errorWithDomain(KRString domain, long long cod
 KRString KRError::localizedDescription() const {
   KRString text = userInfo_.objectForKey(NSLocalizedDescriptionKey).string();
   if (text) return text;
-  return KRString("The operation couldn\u2019t be completed. (" + domain_.str() + " error " + std::to_string(code_) +
-                  ".)");
+  return KRString("The operation couldn\u2019t be completed. (" + domain_.str() + " error " +
+                  std::to_string(code_) + ".)");
 }
 
 std::string KRError::description() const {
-  return "Error Domain=" + domain_.str() + " Code=" + std::to_string(code_) + " \"" + localizedDescription().str() +
-         "\"";
+  return "Error Domain=" + domain_.str() + " Code=" + std::to_string(code_) + " \"" +
+         localizedDescription().str() + "\"";
 }

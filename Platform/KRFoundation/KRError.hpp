@@ -10,7 +10,8 @@ class KRError : public KRObject {
  public:
   static constexpr const char* NSLocalizedDescriptionKey = "NSLocalizedDescription";
 
-  static std::shared_ptr<KRError> errorWithDomain(KRString domain, long long code, KRDictionary userInfo = {});
+  static std::shared_ptr<KRError> errorWithDomain(KRString domain, long long code,
+                                                  KRDictionary userInfo = {});
 
   const KRString& domain() const { return domain_; }
   long long code() const { return code_; }

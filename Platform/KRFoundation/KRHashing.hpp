@@ -14,6 +14,8 @@ constexpr uint64_t mix(uint64_t value) {
 }
 
 // Order-dependent combination of a running hash with one more value.
-constexpr uint64_t combine(uint64_t seed, uint64_t value) { return mix(seed ^ (mix(value) + (seed << 6) + (seed >> 2))); }
+constexpr uint64_t combine(uint64_t seed, uint64_t value) {
+  return mix(seed ^ (mix(value) + (seed << 6) + (seed >> 2)));
+}
 
 }  // namespace KRHashing

@@ -27,8 +27,12 @@ class KRMapTable {
   void removeAllObjects() { map_.clear(); }
   size_t count() const { return map_.size(); }
 
-  std::vector<Key> allKeys() const { return collect([](const auto& entry) { return entry.first; }); }
-  std::vector<Value> allValues() const { return collect([](const auto& entry) { return entry.second; }); }
+  std::vector<Key> allKeys() const {
+    return collect([](const auto& entry) { return entry.first; });
+  }
+  std::vector<Value> allValues() const {
+    return collect([](const auto& entry) { return entry.second; });
+  }
   // Calls body(key, value) for every entry; the table must not change meanwhile.
   template <class Body>
   void forEach(Body&& body) const {

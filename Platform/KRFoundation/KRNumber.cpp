@@ -70,10 +70,14 @@ KRNumber::Kind KRNumber::kind() const { return repr_ ? repr_->kind : Kind::Int; 
 bool KRNumber::boolValue() const {
   if (!repr_) return false;
   switch (repr_->kind) {
-    case Kind::Bool: return repr_->b;
-    case Kind::Int: return repr_->i != 0;
-    case Kind::UInt: return repr_->u != 0;
-    case Kind::Double: return repr_->d != 0.0;
+    case Kind::Bool:
+      return repr_->b;
+    case Kind::Int:
+      return repr_->i != 0;
+    case Kind::UInt:
+      return repr_->u != 0;
+    case Kind::Double:
+      return repr_->d != 0.0;
   }
   return false;
 }
@@ -83,9 +87,12 @@ int KRNumber::intValue() const { return static_cast<int>(longLongValue()); }
 long long KRNumber::longLongValue() const {
   if (!repr_) return 0;
   switch (repr_->kind) {
-    case Kind::Bool: return repr_->b ? 1 : 0;
-    case Kind::Int: return repr_->i;
-    case Kind::UInt: return static_cast<long long>(repr_->u);
+    case Kind::Bool:
+      return repr_->b ? 1 : 0;
+    case Kind::Int:
+      return repr_->i;
+    case Kind::UInt:
+      return static_cast<long long>(repr_->u);
     case Kind::Double: {
       const double d = repr_->d;
       if (std::isnan(d)) return 0;
@@ -109,10 +116,14 @@ unsigned long long KRNumber::unsignedLongLongValue() const {
 double KRNumber::doubleValue() const {
   if (!repr_) return 0.0;
   switch (repr_->kind) {
-    case Kind::Bool: return repr_->b ? 1.0 : 0.0;
-    case Kind::Int: return static_cast<double>(repr_->i);
-    case Kind::UInt: return static_cast<double>(repr_->u);
-    case Kind::Double: return repr_->d;
+    case Kind::Bool:
+      return repr_->b ? 1.0 : 0.0;
+    case Kind::Int:
+      return static_cast<double>(repr_->i);
+    case Kind::UInt:
+      return static_cast<double>(repr_->u);
+    case Kind::Double:
+      return repr_->d;
   }
   return 0.0;
 }
@@ -120,9 +131,12 @@ double KRNumber::doubleValue() const {
 std::string KRNumber::stringValue() const {
   if (!repr_) return "";
   switch (repr_->kind) {
-    case Kind::Bool: return repr_->b ? "1" : "0";
-    case Kind::Int: return std::to_string(repr_->i);
-    case Kind::UInt: return std::to_string(repr_->u);
+    case Kind::Bool:
+      return repr_->b ? "1" : "0";
+    case Kind::Int:
+      return std::to_string(repr_->i);
+    case Kind::UInt:
+      return std::to_string(repr_->u);
     case Kind::Double: {
       if (std::isnan(repr_->d)) return "nan";
       if (std::isinf(repr_->d)) return repr_->d > 0 ? "inf" : "-inf";
@@ -137,7 +151,8 @@ std::string KRNumber::stringValue() const {
 KRComparisonResult KRNumber::compare(const KRNumber& other) const {
   const Kind a = kind();
   const Kind b = other.kind();
-  if (a == Kind::UInt && b == Kind::UInt) return orderIntegers(unsignedLongLongValue(), other.unsignedLongLongValue());
+  if (a == Kind::UInt && b == Kind::UInt)
+    return orderIntegers(unsignedLongLongValue(), other.unsignedLongLongValue());
   if (a != Kind::Double && b != Kind::Double && a != Kind::UInt && b != Kind::UInt) {
     return orderIntegers(longLongValue(), other.longLongValue());
   }

@@ -14,8 +14,8 @@
 std::string KRObject::className() const {
   const char* mangled = typeid(*this).name();
   int status = 0;
-  std::unique_ptr<char, decltype(&std::free)> demangled(abi::__cxa_demangle(mangled, nullptr, nullptr, &status),
-                                                        &std::free);
+  std::unique_ptr<char, decltype(&std::free)> demangled(
+      abi::__cxa_demangle(mangled, nullptr, nullptr, &status), &std::free);
   return status == 0 && demangled ? std::string(demangled.get()) : std::string(mangled);
 }
 
@@ -37,7 +37,9 @@ KRValue KRObject::valueForUndefinedKey(const std::string& key) const {
   raiseUndefinedKey(defaultDescription(), "valueForUndefinedKey:", key);
 }
 
-void KRObject::setValueForKey(const KRValue& value, const std::string& key) { setValueForUndefinedKey(value, key); }
+void KRObject::setValueForKey(const KRValue& value, const std::string& key) {
+  setValueForUndefinedKey(value, key);
+}
 
 void KRObject::setValueForUndefinedKey(const KRValue&, const std::string& key) {
   raiseUndefinedKey(defaultDescription(), "setValue:forUndefinedKey:", key);
@@ -49,8 +51,9 @@ KRValue KRObject::valueForKeyPath(const std::string& keyPath) const {
   return valueForKey(keyPath.substr(0, dot)).valueForKeyPath(keyPath.substr(dot + 1));
 }
 
-void KRObject::raiseUndefinedKey(const std::string& receiver, const std::string& operation, const std::string& key) {
+void KRObject::raiseUndefinedKey(const std::string& receiver, const std::string& operation,
+                                 const std::string& key) {
   KRException::raise(KRException::NSUnknownKeyException,
-                     "[" + receiver + " " + operation + "]: this class is not key value coding-compliant for the key " +
-                         key + ".");
+                     "[" + receiver + " " + operation +
+                         "]: this class is not key value coding-compliant for the key " + key + ".");
 }

@@ -31,7 +31,9 @@ const std::vector<KRValue>& KRSet::allObjects() const {
   return storage_ ? storage_->members : empty;
 }
 
-bool KRSet::containsObject(const KRValue& value) const { return storage_ && storage_->index.count(value) > 0; }
+bool KRSet::containsObject(const KRValue& value) const {
+  return storage_ && storage_->index.count(value) > 0;
+}
 
 KRSet KRSet::setByAddingObject(const KRValue& value) const {
   auto storage = storage_ ? std::make_shared<Storage>(*storage_) : std::make_shared<Storage>();

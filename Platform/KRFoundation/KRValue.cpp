@@ -33,7 +33,8 @@ KRValue::KRValue(KRString string) : storage_(storageFor<KRString, Storage>(std::
 KRValue::KRValue(KRDate date) : storage_(storageFor<KRDate, Storage>(std::move(date))) {}
 KRValue::KRValue(KRArray array) : storage_(storageFor<KRArray, Storage>(std::move(array))) {}
 KRValue::KRValue(KRSet set) : storage_(storageFor<KRSet, Storage>(std::move(set))) {}
-KRValue::KRValue(KRDictionary dictionary) : storage_(storageFor<KRDictionary, Storage>(std::move(dictionary))) {}
+KRValue::KRValue(KRDictionary dictionary)
+    : storage_(storageFor<KRDictionary, Storage>(std::move(dictionary))) {}
 KRValue::KRValue(std::shared_ptr<KRObject> object) {
   if (object) storage_ = std::move(object);
 }
@@ -87,20 +88,29 @@ bool identical(const KRValue& a, const KRValue& b) {
 
 std::string KRValue::description() const {
   switch (type()) {
-    case Type::Nil: return "(null)";
-    case Type::Null: return "<null>";
-    case Type::Number: return number().stringValue();
-    case Type::String: return string().str();
-    case Type::Date: return date().description();
-    case Type::Array: return joined(array().values(), "(", ")");
-    case Type::Set: return joined(set().allObjects(), "{(", ")}");
+    case Type::Nil:
+      return "(null)";
+    case Type::Null:
+      return "<null>";
+    case Type::Number:
+      return number().stringValue();
+    case Type::String:
+      return string().str();
+    case Type::Date:
+      return date().description();
+    case Type::Array:
+      return joined(array().values(), "(", ")");
+    case Type::Set:
+      return joined(set().allObjects(), "{(", ")}");
     case Type::Dictionary: {
       std::string text = "{";
-      for (const auto& [key, value] : dictionary().entries()) text += key.description() + " = " + value.description() + "; ";
+      for (const auto& [key, value] : dictionary().entries())
+        text += key.description() + " = " + value.description() + "; ";
       if (text.size() > 1) text.pop_back();
       return text + "}";
     }
-    case Type::Object: return object()->description();
+    case Type::Object:
+      return object()->description();
   }
   return "";
 }
@@ -108,15 +118,21 @@ std::string KRValue::description() const {
 KRValue KRValue::valueForKey(const std::string& key) const {
   switch (type()) {
     case Type::Nil:
-    case Type::Null: return KRValue();
-    case Type::Dictionary: return dictionary().objectForKey(key);
-    case Type::Array: return mappedArray(key);
-    case Type::Set: return mappedSet(key);
+    case Type::Null:
+      return KRValue();
+    case Type::Dictionary:
+      return dictionary().objectForKey(key);
+    case Type::Array:
+      return mappedArray(key);
+    case Type::Set:
+      return mappedSet(key);
     case Type::Date:
       if (key == "timeIntervalSince1970") return date().timeIntervalSince1970();
       break;
-    case Type::Object: return object()->valueForKey(key);
-    default: break;
+    case Type::Object:
+      return object()->valueForKey(key);
+    default:
+      break;
   }
   KRObject::raiseUndefinedKey(description(), "valueForUndefinedKey:", key);
 }

@@ -30,10 +30,10 @@ class KRValue {
   KRValue(KRNull) : storage_(KRNull{}) {}
   KRValue(bool value) : KRValue(KRNumber::numberWithBool(value)) {}
   template <std::integral T>
-    requires(!std::same_as<T, bool>)
-  KRValue(T value)
-      : KRValue(std::is_signed_v<T> ? KRNumber::numberWithLongLong(static_cast<long long>(value))
-                                    : KRNumber::numberWithUnsignedLongLong(static_cast<unsigned long long>(value))) {}
+  requires(!std::same_as<T, bool>) KRValue(T value)
+      : KRValue(std::is_signed_v<T>
+                    ? KRNumber::numberWithLongLong(static_cast<long long>(value))
+                    : KRNumber::numberWithUnsignedLongLong(static_cast<unsigned long long>(value))) {}
   KRValue(double value) : KRValue(KRNumber::numberWithDouble(value)) {}
   KRValue(const char* text) : KRValue(KRString(text)) {}
   KRValue(std::string text) : KRValue(KRString(std::move(text))) {}
@@ -45,8 +45,8 @@ class KRValue {
   KRValue(KRDictionary dictionary);
   KRValue(std::shared_ptr<KRObject> object);
   template <class T>
-    requires std::derived_from<T, KRObject>
-  KRValue(std::shared_ptr<T> object) : KRValue(std::static_pointer_cast<KRObject>(std::move(object))) {}
+  requires std::derived_from<T, KRObject> KRValue(std::shared_ptr<T> object)
+      : KRValue(std::static_pointer_cast<KRObject>(std::move(object))) {}
 
   static KRValue null() { return KRValue(KRNull{}); }
 
@@ -84,8 +84,8 @@ class KRValue {
   KRValue mappedArray(const std::string& key) const;
   KRValue mappedSet(const std::string& key) const;
 
-  using Storage = std::variant<std::monostate, KRNull, KRNumber, KRString, KRDate, KRArray, KRSet, KRDictionary,
-                               std::shared_ptr<KRObject>>;
+  using Storage = std::variant<std::monostate, KRNull, KRNumber, KRString, KRDate, KRArray, KRSet,
+                               KRDictionary, std::shared_ptr<KRObject>>;
   Storage storage_;
 };
 

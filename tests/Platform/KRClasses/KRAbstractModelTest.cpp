@@ -113,8 +113,8 @@ TEST(KRAbstractModelTest, ObserverRemovedByAnEarlierOneIsNotCalled) {
 TEST(KRAbstractModelTest, NextIterationBlockRunsOnTheMainRunLoopLater) {
   auto model = std::make_shared<Model>();
   bool ran = false;
-  model->performOnNextRunLoopIterationBlock([&ran] { ran = true; }, {KRRunLoop::NSRunLoopCommonModes,
-                                                                     KRRunLoop::NSDefaultRunLoopMode});
+  model->performOnNextRunLoopIterationBlock(
+      [&ran] { ran = true; }, {KRRunLoop::NSRunLoopCommonModes, KRRunLoop::NSDefaultRunLoopMode});
   EXPECT_FALSE(ran);
   EXPECT_TRUE(runMainLoopUntil([&ran] { return ran; }));
 }

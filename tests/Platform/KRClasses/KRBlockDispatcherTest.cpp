@@ -16,7 +16,9 @@ std::shared_ptr<KRBlockDispatcher> makeDispatcher(const std::string& label = "te
 
 }  // namespace
 
-TEST(KRBlockDispatcherTest, NoQueueGivesNil) { EXPECT_EQ(KRBlockDispatcher::initWithDispatchQueue(nullptr), nullptr); }
+TEST(KRBlockDispatcherTest, NoQueueGivesNil) {
+  EXPECT_EQ(KRBlockDispatcher::initWithDispatchQueue(nullptr), nullptr);
+}
 
 TEST(KRBlockDispatcherTest, KeepsTheOrderOfTenThousandBlocks) {
   auto dispatcher = makeDispatcher();

@@ -3,7 +3,8 @@
 #include <gtest/gtest.h>
 
 TEST(KRErrorTest, HoldsDomainCodeAndUserInfo) {
-  auto error = KRError::errorWithDomain("KRCatalogErrorDomain", 1, {{KRError::NSLocalizedDescriptionKey, "Broken"}});
+  auto error =
+      KRError::errorWithDomain("KRCatalogErrorDomain", 1, {{KRError::NSLocalizedDescriptionKey, "Broken"}});
   EXPECT_EQ(error->domain(), KRString("KRCatalogErrorDomain"));
   EXPECT_EQ(error->code(), 1);
   EXPECT_EQ(error->localizedDescription(), KRString("Broken"));
@@ -12,5 +13,6 @@ TEST(KRErrorTest, HoldsDomainCodeAndUserInfo) {
 
 TEST(KRErrorTest, GenericDescriptionWithoutUserInfo) {
   auto error = KRError::errorWithDomain("D", -7);
-  EXPECT_EQ(error->localizedDescription(), KRString("The operation couldn\u2019t be completed. (D error -7.)"));
+  EXPECT_EQ(error->localizedDescription(),
+            KRString("The operation couldn\u2019t be completed. (D error -7.)"));
 }

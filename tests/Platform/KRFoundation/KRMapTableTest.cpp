@@ -14,8 +14,9 @@ struct Key {
 using KeyPtr = std::shared_ptr<const Key>;
 
 KRMapTable<KeyPtr, std::string> byTypeAndId() {
-  return KRMapTable<KeyPtr, std::string>([](const KeyPtr& k) { return static_cast<uint64_t>(k->type * 1000 + k->id); },
-                                         [](const KeyPtr& a, const KeyPtr& b) { return a->type == b->type && a->id == b->id; });
+  return KRMapTable<KeyPtr, std::string>(
+      [](const KeyPtr& k) { return static_cast<uint64_t>(k->type * 1000 + k->id); },
+      [](const KeyPtr& a, const KeyPtr& b) { return a->type == b->type && a->id == b->id; });
 }
 
 KRMapTable<KeyPtr, std::string> byIdOnly() {

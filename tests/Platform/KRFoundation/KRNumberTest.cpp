@@ -53,7 +53,8 @@ TEST(KRNumberTest, ConversionsBetweenKinds) {
 TEST(KRNumberTest, StringValueOfEachKind) {
   EXPECT_EQ(KRNumber::numberWithBool(true).stringValue(), "1");
   EXPECT_EQ(KRNumber::numberWithLongLong(-42).stringValue(), "-42");
-  EXPECT_EQ(KRNumber::numberWithUnsignedLongLong(18446744073709551615ULL).stringValue(), "18446744073709551615");
+  EXPECT_EQ(KRNumber::numberWithUnsignedLongLong(18446744073709551615ULL).stringValue(),
+            "18446744073709551615");
   EXPECT_EQ(KRNumber::numberWithDouble(3.0).stringValue(), "3");
   EXPECT_EQ(KRNumber::numberWithDouble(0.1).stringValue(), "0.1");
 }

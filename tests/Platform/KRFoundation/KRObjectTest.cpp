@@ -66,7 +66,8 @@ TEST(KRObjectTest, UnknownKeysRaiseByDefault) {
     FAIL() << "no exception";
   } catch (const KRException& exception) {
     EXPECT_EQ(exception.name(), KRString(KRException::NSUnknownKeyException));
-    EXPECT_NE(exception.reason().str().find("not key value coding-compliant for the key nothing."), std::string::npos);
+    EXPECT_NE(exception.reason().str().find("not key value coding-compliant for the key nothing."),
+              std::string::npos);
   }
   EXPECT_THROW(object->setValueForKey(1, "nothing"), KRException);
 }

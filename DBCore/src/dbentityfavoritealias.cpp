@@ -1,0 +1,15 @@
+#include "dbentityfavoritealias.hpp"
+
+namespace dbcore {
+
+const std::vector<DBColumn<DBEntityFavoriteAlias>>& DBEntityFavoriteAlias::columns() {
+  static const std::vector<DBColumn<DBEntityFavoriteAlias>> columns{
+      DBField<DBEntityFavoriteAlias, &DBEntityFavoriteAlias::favorite>("favorite_bool"),
+      DBField<DBEntityFavoriteAlias, &DBEntityFavoriteAlias::favorite_order>("favorite_order_float"),
+      DBField<DBEntityFavoriteAlias, &DBEntityFavoriteAlias::orig_type>("orig_entity_type"),
+      DBField<DBEntityFavoriteAlias, &DBEntityFavoriteAlias::orig_id>("orig_entity_id_int_64"),
+  };
+  return columns;
+}
+
+}  // namespace dbcore

@@ -1,0 +1,13 @@
+#include "dbfilter.hpp"
+
+namespace dbcore {
+
+const std::vector<DBColumn<DBFilter>>& DBFilter::columns() {
+  static const std::vector<DBColumn<DBFilter>> columns{
+      DBField<DBFilter, &DBFilter::name>("name_wide_ch"),
+      DBField<DBFilter, &DBFilter::order>("order_float"),
+  };
+  return columns;
+}
+
+}  // namespace dbcore

@@ -1,0 +1,14 @@
+#include "dbreffolderattrib.hpp"
+
+namespace dbcore {
+
+const std::vector<DBColumn<DBRefFolderAttrib>>& DBRefFolderAttrib::columns() {
+  static const std::vector<DBColumn<DBRefFolderAttrib>> columns{
+      DBField<DBRefFolderAttrib, &DBRefFolderAttrib::ref_folder_id>("ref_folder_id_int_64"),
+      DBField<DBRefFolderAttrib, &DBRefFolderAttrib::favorite>("favorite_bool"),
+      DBField<DBRefFolderAttrib, &DBRefFolderAttrib::selected_filter_types>("selected_filter_types_wide_ch"),
+  };
+  return columns;
+}
+
+}  // namespace dbcore

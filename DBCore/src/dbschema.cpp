@@ -1,0 +1,196 @@
+#include "dbschema.hpp"
+
+#include <string>
+#include <vector>
+
+#include "dbconnection.hpp"
+#include "dbexception.hpp"
+#include "dbrecords.hpp"
+
+namespace dbcore {
+
+namespace {
+
+// Version 119: every record table, the links between records and the catalog's key-value info.
+constexpr const char* kCreateTables = R"sql(
+CREATE TABLE catalog_info (key TEXT PRIMARY KEY, value INTEGER NOT NULL) WITHOUT ROWID;
+CREATE TABLE volumes (
+  _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
+  uuid_wide_ch TEXT NOT NULL DEFAULT '', info_wide_ch TEXT NOT NULL DEFAULT '');
+CREATE TABLE paths (
+  _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
+  volume_id_int_64 INTEGER NOT NULL DEFAULT 0, path_wide_ch TEXT NOT NULL DEFAULT '');
+CREATE TABLE images (
+  _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
+  guid_wide_ch TEXT NOT NULL DEFAULT '', path_wide_ch TEXT NOT NULL DEFAULT '',
+  width INTEGER NOT NULL DEFAULT 0, height INTEGER NOT NULL DEFAULT 0,
+  file_size_int_64 INTEGER NOT NULL DEFAULT 0, modification_date_int_64 INTEGER NOT NULL DEFAULT 0,
+  import_date_int_64 INTEGER NOT NULL DEFAULT 0, import_index INTEGER NOT NULL DEFAULT 0,
+  creation_date_int_64 INTEGER NOT NULL DEFAULT 0,
+  folder_path_id INTEGER REFERENCES paths(_id_int_64) ON DELETE SET NULL);
+CREATE TABLE image_user_attributes (
+  _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
+  image_id_int_64 INTEGER NOT NULL UNIQUE REFERENCES images(_id_int_64) ON DELETE CASCADE,
+  trash_bool INTEGER NOT NULL DEFAULT 0, marker INTEGER NOT NULL DEFAULT 0, color INTEGER NOT NULL DEFAULT 0,
+  rating INTEGER NOT NULL DEFAULT 0, edit_date_int_64 INTEGER NOT NULL DEFAULT 0,
+  opened_bool INTEGER NOT NULL DEFAULT 0, trashed_date_int_64 INTEGER NOT NULL DEFAULT 0,
+  origin_path_wide_ch TEXT NOT NULL DEFAULT '', lost_bool INTEGER NOT NULL DEFAULT 0,
+  tutorial INTEGER NOT NULL DEFAULT 0);
+CREATE TABLE image_exiv_attributes (
+  _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
+  image_id_int_64 INTEGER NOT NULL UNIQUE REFERENCES images(_id_int_64) ON DELETE CASCADE,
+  iso_speed REAL NOT NULL DEFAULT 0, shutter_speed REAL NOT NULL DEFAULT 0, number REAL NOT NULL DEFAULT 0,
+  focal_len REAL NOT NULL DEFAULT 0, focal_len35mm REAL NOT NULL DEFAULT 0, ev REAL NOT NULL DEFAULT 0,
+  focal_len_min REAL NOT NULL DEFAULT 0, focal_len_max REAL NOT NULL DEFAULT 0,
+  shutter_min REAL NOT NULL DEFAULT 0, shutter_max REAL NOT NULL DEFAULT 0, aperture REAL NOT NULL DEFAULT 0,
+  focus_distance REAL NOT NULL DEFAULT 0, bits_per_sample INTEGER NOT NULL DEFAULT 0,
+  white_balance INTEGER NOT NULL DEFAULT 0, white_balance_index INTEGER NOT NULL DEFAULT 0,
+  light_source INTEGER NOT NULL DEFAULT 0, metering_mode INTEGER NOT NULL DEFAULT 0,
+  camera_maker_wide_ch TEXT NOT NULL DEFAULT '', camera_name_wide_ch TEXT NOT NULL DEFAULT '',
+  camera_model_wide_ch TEXT NOT NULL DEFAULT '', lens_maker_wide_ch TEXT NOT NULL DEFAULT '',
+  lens_pretty_name_wide_ch TEXT NOT NULL DEFAULT '', date_time_int_64 INTEGER NOT NULL DEFAULT 0,
+  is_raw_bool INTEGER NOT NULL DEFAULT 0, is_full_filled_bool INTEGER NOT NULL DEFAULT 0,
+  version INTEGER NOT NULL DEFAULT 0);
+CREATE TABLE image_history_states (
+  _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
+  action_name_wide_ch TEXT NOT NULL DEFAULT '', additional_info_wide_ch TEXT NOT NULL DEFAULT '',
+  guid_wide_ch TEXT NOT NULL DEFAULT '', crop_description_wide_ch TEXT NOT NULL DEFAULT '',
+  image_orientation_int_64 INTEGER NOT NULL DEFAULT 0, state_hash_wide_ch TEXT NOT NULL DEFAULT '',
+  original_bool INTEGER NOT NULL DEFAULT 0);
+CREATE TABLE image_states (
+  image_id INTEGER NOT NULL REFERENCES images(_id_int_64) ON DELETE CASCADE,
+  state_id INTEGER NOT NULL REFERENCES image_history_states(_id_int_64) ON DELETE CASCADE,
+  position INTEGER NOT NULL, is_current INTEGER NOT NULL DEFAULT 0,
+  PRIMARY KEY (image_id, state_id)) WITHOUT ROWID;
+CREATE TABLE history_resources (
+  _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
+  name_wide_ch TEXT NOT NULL DEFAULT '');
+CREATE TABLE state_resources (
+  state_id INTEGER NOT NULL REFERENCES image_history_states(_id_int_64) ON DELETE CASCADE,
+  resource_id INTEGER NOT NULL REFERENCES history_resources(_id_int_64) ON DELETE CASCADE,
+  PRIMARY KEY (state_id, resource_id)) WITHOUT ROWID;
+CREATE TABLE filters (
+  _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
+  name_wide_ch TEXT NOT NULL DEFAULT '', order_float REAL NOT NULL DEFAULT 0,
+  parent_id INTEGER REFERENCES filters(_id_int_64) ON DELETE CASCADE);
+CREATE TABLE filter_attributes (
+  _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
+  filter_id_int_64 INTEGER NOT NULL UNIQUE REFERENCES filters(_id_int_64) ON DELETE CASCADE,
+  favorite_bool INTEGER NOT NULL DEFAULT 0, selected_filter_types_wide_ch TEXT NOT NULL DEFAULT '');
+CREATE TABLE filter_images (
+  filter_id INTEGER NOT NULL REFERENCES filters(_id_int_64) ON DELETE CASCADE,
+  image_id INTEGER NOT NULL REFERENCES images(_id_int_64) ON DELETE CASCADE,
+  PRIMARY KEY (filter_id, image_id)) WITHOUT ROWID;
+CREATE TABLE smart_filters (
+  _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
+  identifier_wide_ch TEXT NOT NULL DEFAULT '', filter_conditions_wide_ch TEXT NOT NULL DEFAULT '',
+  applying_conditions_wide_ch TEXT NOT NULL DEFAULT '', name_wide_ch TEXT NOT NULL DEFAULT '',
+  parent_id INTEGER REFERENCES smart_filters(_id_int_64) ON DELETE CASCADE);
+CREATE TABLE smart_filter_attributes (
+  _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
+  smart_filter_id_int_64 INTEGER NOT NULL UNIQUE REFERENCES smart_filters(_id_int_64) ON DELETE CASCADE,
+  selected_filter_types_wide_ch TEXT NOT NULL DEFAULT '');
+CREATE TABLE referenced_folders (
+  _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
+  uuid_wide_ch TEXT NOT NULL DEFAULT '', path_id_int_64 INTEGER NOT NULL DEFAULT 0,
+  order_float REAL NOT NULL DEFAULT 0,
+  parent_id INTEGER REFERENCES referenced_folders(_id_int_64) ON DELETE CASCADE);
+CREATE TABLE referenced_folder_attributes (
+  _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
+  ref_folder_id_int_64 INTEGER NOT NULL UNIQUE REFERENCES referenced_folders(_id_int_64) ON DELETE CASCADE,
+  favorite_bool INTEGER NOT NULL DEFAULT 0, selected_filter_types_wide_ch TEXT NOT NULL DEFAULT '');
+CREATE TABLE referenced_folder_images (
+  ref_folder_id INTEGER NOT NULL REFERENCES referenced_folders(_id_int_64) ON DELETE CASCADE,
+  image_id INTEGER NOT NULL REFERENCES images(_id_int_64) ON DELETE CASCADE,
+  PRIMARY KEY (ref_folder_id, image_id)) WITHOUT ROWID;
+CREATE TABLE favorite_aliases (
+  _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
+  favorite_bool INTEGER NOT NULL DEFAULT 0, favorite_order_float REAL NOT NULL DEFAULT 0,
+  orig_entity_type INTEGER NOT NULL DEFAULT 0, orig_entity_id_int_64 INTEGER NOT NULL DEFAULT 0,
+  UNIQUE (orig_entity_type, orig_entity_id_int_64));
+)sql";
+
+// Version 120: indexes on every link column and on the columns conditions filter on.
+constexpr const char* kCreateIndexes = R"sql(
+CREATE INDEX images_folder ON images(folder_path_id);
+CREATE INDEX images_guid ON images(guid_wide_ch);
+CREATE INDEX images_import_date ON images(import_date_int_64);
+CREATE INDEX paths_volume ON paths(volume_id_int_64, path_wide_ch);
+CREATE INDEX user_attributes_trash ON image_user_attributes(trash_bool);
+CREATE INDEX user_attributes_rating ON image_user_attributes(rating);
+CREATE INDEX exiv_attributes_camera_model ON image_exiv_attributes(camera_model_wide_ch);
+CREATE INDEX exiv_attributes_date ON image_exiv_attributes(date_time_int_64);
+CREATE INDEX image_states_state ON image_states(state_id);
+CREATE INDEX state_resources_resource ON state_resources(resource_id);
+CREATE INDEX filters_parent ON filters(parent_id);
+CREATE INDEX filter_images_image ON filter_images(image_id);
+CREATE INDEX smart_filters_parent ON smart_filters(parent_id);
+CREATE INDEX referenced_folders_parent ON referenced_folders(parent_id);
+CREATE INDEX referenced_folders_path ON referenced_folders(path_id_int_64);
+CREATE INDEX referenced_folder_images_image ON referenced_folder_images(image_id);
+)sql";
+
+struct MigrationStep {
+  int version;
+  const char* sql;
+};
+
+const std::vector<MigrationStep>& migrationSteps() {
+  static const std::vector<MigrationStep> steps{{119, kCreateTables}, {120, kCreateIndexes}};
+  return steps;
+}
+
+// Preparing a query over every column of a record table fails when a table or column is missing.
+template <class Record>
+bool hasAllColumns(DBConnection& connection) {
+  std::string sql = "SELECT ";
+  for (const auto& column : Record::all_columns()) sql += std::string(column.name) + ",";
+  sql.back() = ' ';
+  sql += std::string("FROM ") + Record::kTableName + " LIMIT 0";
+  try {
+    connection.prepare(sql);
+    return true;
+  } catch (const DBException&) {
+    return false;
+  }
+}
+
+template <class... Records>
+bool haveAllColumns(DBConnection& connection) {
+  return (hasAllColumns<Records>(connection) && ...);
+}
+
+}  // namespace
+
+int32_t DBSchema::applicationIdFor(int32_t appInfo) {
+  return static_cast<int32_t>(0x4B524300u | (static_cast<uint32_t>(appInfo) & 0xFFu));
+}
+
+void DBSchema::migrate(DBConnection& connection, int fromVersion) {
+  for (const auto& step : migrationSteps()) {
+    if (step.version > fromVersion) connection.exec(step.sql);
+  }
+  connection.exec("PRAGMA user_version = " + std::to_string(kCurrentVersion));
+}
+
+void DBSchema::createRootRecords(DBConnection& connection) {
+  connection.exec("INSERT OR IGNORE INTO filters(_id_int_64, parent_id) VALUES (1, NULL)");
+  connection.exec("INSERT OR IGNORE INTO referenced_folders(_id_int_64, parent_id) VALUES (1, NULL)");
+}
+
+bool DBSchema::isWellFormed(DBConnection& connection) {
+  const char* linkTables[] = {"image_states", "state_resources", "filter_images", "referenced_folder_images",
+                              "catalog_info"};
+  for (const char* table : linkTables) {
+    try {
+      connection.prepare(std::string("SELECT * FROM ") + table + " LIMIT 0");
+    } catch (const DBException&) {
+      return false;
+    }
+  }
+  return haveAllColumns<DBImage, DBPath, DBVolume, DBUserImgAttrib, DBExivImgAttrib, DBImgHistoryState,
+                        DBResource, DBFilter, DBFilterAttrib, DBSmartFilter, DBSmartFilterAttrib, DBRefFolder,
+                        DBRefFolderAttrib, DBEntityFavoriteAlias>(connection);
+}
+
+}  // namespace dbcore

@@ -1,0 +1,14 @@
+#include "dbsmartfilterattrib.hpp"
+
+namespace dbcore {
+
+const std::vector<DBColumn<DBSmartFilterAttrib>>& DBSmartFilterAttrib::columns() {
+  static const std::vector<DBColumn<DBSmartFilterAttrib>> columns{
+      DBField<DBSmartFilterAttrib, &DBSmartFilterAttrib::smart_filter_id>("smart_filter_id_int_64"),
+      DBField<DBSmartFilterAttrib, &DBSmartFilterAttrib::selected_filter_types>(
+          "selected_filter_types_wide_ch"),
+  };
+  return columns;
+}
+
+}  // namespace dbcore

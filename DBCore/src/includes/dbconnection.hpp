@@ -1,0 +1,47 @@
+#pragma once
+
+#include <sqlite3.h>
+
+#include <functional>
+#include <memory>
+#include <string>
+#include <unordered_map>
+
+#include "dbstatement.hpp"
+
+namespace dbcore {
+
+// One SQLite connection with a cache of prepared statements. Not thread-safe: used on one queue.
+class DBConnection {
+ public:
+  // Opens (creating when missing) the file defensively: defensive mode on, untrusted schema, WAL journal
+  // where the file allows it, foreign keys on. Throws DBException when the file cannot be opened.
+  explicit DBConnection(const std::string& path);
+  ~DBConnection();
+  DBConnection(const DBConnection&) = delete;
+  DBConnection& operator=(const DBConnection&) = delete;
+
+  // Runs SQL text of the engine's own (never built from outside input) with no results.
+  void exec(const std::string& sql);
+  // The cached prepared statement for the SQL text, reset and ready to bind.
+  DBStatement& prepare(const std::string& sql);
+  // One integer from a query returning one row and column (0 when there is no row).
+  int64_t queryInt64(const std::string& sql);
+
+  // Runs the body atomically: in a transaction, or a savepoint when one is already open. An exception
+  // leaving the body rolls back everything it wrote and passes on.
+  void transaction(const std::function<void()>& body);
+
+  int64_t lastInsertRowId() const { return sqlite3_last_insert_rowid(db_); }
+  int changes() const { return sqlite3_changes(db_); }
+  sqlite3* handle() const { return db_; }
+
+ private:
+  void configure();
+
+  sqlite3* db_ = nullptr;
+  std::unordered_map<std::string, std::unique_ptr<DBStatement>> statements_;
+  int transactionDepth_ = 0;
+};
+
+}  // namespace dbcore

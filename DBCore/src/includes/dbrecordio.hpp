@@ -1,0 +1,106 @@
+#pragma once
+
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "dbconnection.hpp"
+#include "dbexception.hpp"
+#include "dbrecord.hpp"
+
+namespace dbcore {
+
+// Reads and writes records of any record type through the record type's column list. Column names and
+// table names come only from the record definitions; values are always bound.
+class DBRecordIO {
+ public:
+  // "SELECT <every column> FROM <table>", to be followed by the caller's own clauses.
+  template <class T>
+  static const std::string& selectSql() {
+    static const std::string sql = [] {
+      std::string text = "SELECT ";
+      for (const auto& column : T::all_columns())
+        text += std::string(T::kTableName) + "." + column.name + ",";
+      text.back() = ' ';
+      return text + "FROM " + T::kTableName;
+    }();
+    return sql;
+  }
+
+  // The record in the current row of a statement made from selectSql().
+  template <class T>
+  static std::shared_ptr<T> read(const DBStatement& statement) {
+    auto record = std::make_shared<T>();
+    int index = 0;
+    for (const auto& column : T::all_columns()) column.set(*record, statement.column(index++, column.type));
+    return record;
+  }
+
+  // Every remaining row of a statement made from selectSql(); resets the statement.
+  template <class T>
+  static std::vector<std::shared_ptr<T>> readAll(DBStatement& statement) {
+    std::vector<std::shared_ptr<T>> records;
+    while (statement.step()) records.push_back(read<T>(statement));
+    statement.reset();
+    return records;
+  }
+
+  // The first row only, or an empty pointer; resets the statement.
+  template <class T>
+  static std::shared_ptr<T> readOne(DBStatement& statement) {
+    std::shared_ptr<T> record = statement.step() ? read<T>(statement) : nullptr;
+    statement.reset();
+    return record;
+  }
+
+  template <class T>
+  static std::shared_ptr<T> get(DBConnection& connection, int64_t id) {
+    DBStatement& statement = connection.prepare(selectSql<T>() + " WHERE _id_int_64 = ?");
+    statement.bind(1, id);
+    return readOne<T>(statement);
+  }
+
+  // Inserts an unsaved record (assigning its id) or replaces the stored values of a saved one.
+  template <class T>
+  static void write(DBConnection& connection, T& record) {
+    DBStatement& statement = connection.prepare(upsertSql<T>());
+    int index = 1;
+    for (const auto& column : T::all_columns()) statement.bind(index++, column.get(record));
+    if (!record.is_saved()) statement.bindNull(1);
+    statement.execute();
+    if (!record.is_saved()) record.set_id(connection.lastInsertRowId());
+  }
+
+  // Deletes the record's row; true when there was one.
+  template <class T>
+  static bool remove(DBConnection& connection, const T& record) {
+    connection.prepare(std::string("DELETE FROM ") + T::kTableName + " WHERE _id_int_64 = ?")
+        .bind(1, record.id())
+        .execute();
+    return connection.changes() > 0;
+  }
+
+ private:
+  template <class T>
+  static const std::string& upsertSql() {
+    static const std::string sql = [] {
+      std::string names;
+      std::string values;
+      std::string updates;
+      for (const auto& column : T::all_columns()) {
+        names += std::string(column.name) + ",";
+        values += "?,";
+        if (std::string(column.name) != kIdColumn)
+          updates += std::string(column.name) + "=excluded." + column.name + ",";
+      }
+      names.pop_back();
+      values.pop_back();
+      updates.pop_back();
+      return std::string("INSERT INTO ") + T::kTableName + "(" + names + ") VALUES(" + values +
+             ") ON CONFLICT(_id_int_64) DO UPDATE SET " + updates;
+    }();
+    return sql;
+  }
+};
+
+}  // namespace dbcore

@@ -1,0 +1,46 @@
+#pragma once
+
+#include <sqlite3.h>
+
+#include <cstdint>
+#include <string>
+
+#include "tvariant.hpp"
+
+namespace dbcore {
+
+// One prepared SQLite statement. Binding indexes start at 1, column indexes at 0. Errors throw DBException.
+class DBStatement {
+ public:
+  DBStatement(sqlite3* db, const std::string& sql);
+  ~DBStatement();
+  DBStatement(const DBStatement&) = delete;
+  DBStatement& operator=(const DBStatement&) = delete;
+
+  // Clears bindings and rewinds, ready for a new execution.
+  DBStatement& reset();
+  DBStatement& bind(int index, int64_t value);
+  DBStatement& bind(int index, const std::string& text);
+  DBStatement& bind(int index, const TVariant& value);
+  DBStatement& bindNull(int index);
+
+  // Advances to the next row; false when there are no more rows.
+  bool step();
+  // Runs a statement that returns no rows.
+  void execute();
+
+  int64_t columnInt64(int column) const;
+  double columnDouble(int column) const;
+  std::string columnText(int column) const;
+  bool columnIsNull(int column) const;
+  // The column read as a value of the given field type.
+  TVariant column(int column, FieldType type) const;
+
+ private:
+  [[noreturn]] void fail(int code) const;
+
+  sqlite3* db_;
+  sqlite3_stmt* statement_ = nullptr;
+};
+
+}  // namespace dbcore

@@ -1,0 +1,382 @@
+#include "dbreactor.hpp"
+
+#include <fcntl.h>
+#include <gtest/gtest.h>
+#include <sqlite3.h>
+#include <sys/resource.h>
+#include <unistd.h>
+
+#include <csignal>
+#include <filesystem>
+#include <fstream>
+
+#include "DBReactorTestSupport.hpp"
+#include "dbexception.hpp"
+#include "dbschema.hpp"
+#include "support/KRUnprivilegedUser.hpp"
+
+using namespace dbcore;
+
+namespace {
+
+// Runs SQL on a file with plain SQLite, outside the engine, to make fixture files.
+void rawSql(const std::string& path, const std::string& sql) {
+  sqlite3* db = nullptr;
+  ASSERT_EQ(sqlite3_open(path.c_str(), &db), SQLITE_OK);
+  ASSERT_EQ(sqlite3_exec(db, sql.c_str(), nullptr, nullptr, nullptr), SQLITE_OK) << sqlite3_errmsg(db);
+  sqlite3_close(db);
+}
+
+std::vector<std::string> namedIndexes(const std::string& path) {
+  sqlite3* db = nullptr;
+  std::vector<std::string> names;
+  if (sqlite3_open(path.c_str(), &db) != SQLITE_OK) return names;
+  sqlite3_stmt* statement = nullptr;
+  sqlite3_prepare_v2(db,
+                     "SELECT name FROM sqlite_schema WHERE type = 'index' AND sql IS NOT NULL ORDER BY name",
+                     -1, &statement, nullptr);
+  while (sqlite3_step(statement) == SQLITE_ROW) {
+    names.emplace_back(reinterpret_cast<const char*>(sqlite3_column_text(statement, 0)));
+  }
+  sqlite3_finalize(statement);
+  sqlite3_close(db);
+  return names;
+}
+
+int openResult(const std::string& path, AppInfo appInfo = 5) {
+  DBReactor reactor(appInfo);
+  return reactor.Open(s2ws(path), L"");
+}
+
+class DBReactorTest : public DBReactorTestBase {};
+
+}  // namespace
+
+// ---- Open results
+
+TEST_F(DBReactorTest, NewPathNeedsInitialize) {
+  EXPECT_EQ(openResult(directory.file("new.krcatalog")), kDBOpenNeedsUpdate);
+}
+
+TEST_F(DBReactorTest, InitializedFileIsCurrent) {
+  reactor->Close();
+  EXPECT_EQ(openResult(catalogPath()), kDBOpenCurrent);
+}
+
+TEST_F(DBReactorTest, OlderSchemaNeedsInitializeAndMigrates) {
+  makeImage(L"kept.jpg");
+  reactor->Close();
+  // A file of the oldest version: the tables without the indexes of the current one.
+  const std::vector<std::string> indexes = namedIndexes(catalogPath());
+  ASSERT_FALSE(indexes.empty());
+  for (const auto& index : indexes) rawSql(catalogPath(), "DROP INDEX " + index);
+  rawSql(catalogPath(), "PRAGMA user_version = 119");
+  DBReactor old(5);
+  ASSERT_EQ(old.Open(s2ws(catalogPath()), L""), kDBOpenNeedsUpdate);
+  old.Initialize();
+  EXPECT_EQ(old.DBUserVersion(), DBSchema::kCurrentVersion);
+  EXPECT_EQ(old.Count<DBImage>(), 1u);
+  old.Close();
+  EXPECT_EQ(namedIndexes(catalogPath()), indexes);
+  EXPECT_EQ(openResult(catalogPath()), kDBOpenCurrent);
+}
+
+TEST_F(DBReactorTest, VersionBelowTheOldestIsIncompatible) {
+  reactor->Close();
+  rawSql(catalogPath(), "PRAGMA user_version = 50");
+  EXPECT_EQ(openResult(catalogPath()), kDBOpenIncompatible);
+}
+
+TEST_F(DBReactorTest, NewerSchemaIsIncompatible) {
+  reactor->Close();
+  rawSql(catalogPath(), "PRAGMA user_version = 999;");
+  EXPECT_EQ(openResult(catalogPath()), kDBOpenIncompatible);
+}
+
+TEST_F(DBReactorTest, AnotherApplicationsDatabaseIsIncompatible) {
+  const std::string path = directory.file("other.db");
+  rawSql(path, "CREATE TABLE notes(text TEXT); INSERT INTO notes VALUES ('hello');");
+  EXPECT_EQ(openResult(path), kDBOpenIncompatible);
+  reactor->Close();
+  EXPECT_EQ(openResult(catalogPath(), 6), kDBOpenIncompatible);
+}
+
+TEST_F(DBReactorTest, FileThatIsNotADatabaseFails) {
+  const std::string path = directory.file("text.krcatalog");
+  std::ofstream(path) << "This is not a database, just some text that is long enough to fill a header. "
+                         "More text, more text, more text, more text.";
+  EXPECT_EQ(openResult(path), kDBOpenFailed);
+}
+
+TEST_F(DBReactorTest, TruncatedFileFails) {
+  reactor->Close();
+  std::filesystem::resize_file(catalogPath(), 50);
+  EXPECT_EQ(openResult(catalogPath()), kDBOpenFailed);
+}
+
+TEST_F(DBReactorTest, CorruptedHeaderFails) {
+  reactor->Close();
+  {
+    std::fstream file(catalogPath(), std::ios::in | std::ios::out | std::ios::binary);
+    file.seekp(0);
+    file << "garbage garbage garbage";
+  }
+  EXPECT_EQ(openResult(catalogPath()), kDBOpenFailed);
+}
+
+TEST_F(DBReactorTest, DirectoryFails) { EXPECT_EQ(openResult(directory.path().string()), kDBOpenFailed); }
+
+TEST_F(DBReactorTest, EmptyPathFails) { EXPECT_EQ(openResult(""), kDBOpenFailed); }
+
+TEST_F(DBReactorTest, UnreadablePathFails) {
+  EXPECT_EQ(openResult(directory.file("missing-folder/catalog.krcatalog")), kDBOpenFailed);
+}
+
+TEST_F(DBReactorTest, MalformedSchemaFails) {
+  reactor->Close();
+  rawSql(catalogPath(), "ALTER TABLE images DROP COLUMN import_index;");
+  EXPECT_EQ(openResult(catalogPath()), kDBOpenFailed);
+}
+
+// ---- Initialize and versions
+
+TEST_F(DBReactorTest, InitializeCreatesTheHiddenRoots) {
+  auto rootFilter = reactor->GetRoot<DBFilter>();
+  auto rootFolder = reactor->GetRoot<DBRefFolder>();
+  ASSERT_TRUE(rootFilter);
+  ASSERT_TRUE(rootFolder);
+  EXPECT_EQ(rootFilter->id(), 1);
+  EXPECT_EQ(rootFolder->id(), 1);
+  EXPECT_EQ(reactor->DBUserVersion(), DBSchema::kCurrentVersion);
+}
+
+TEST_F(DBReactorTest, ProductVersionRoundTrips) {
+  EXPECT_GE(reactor->DBUserVersion(), 119);
+  EXPECT_EQ(reactor->GetDBApplicationID(), 0);
+  reactor->SetDBApplicationID(4217);
+  EXPECT_EQ(reactor->GetDBApplicationID(), 4217);
+  reactor->Close();
+  DBReactor again(5);
+  ASSERT_EQ(again.Open(s2ws(catalogPath()), L""), kDBOpenCurrent);
+  EXPECT_EQ(again.GetDBApplicationID(), 4217);
+}
+
+// ---- Reads and writes
+
+TEST_F(DBReactorTest, WriteAssignsIdsAndGetReadsBack) {
+  auto image = makeImage(L"IMG_0001.CR3");
+  ASSERT_TRUE(image->is_saved());
+  auto read = reactor->Get<DBImage>(image->id());
+  ASSERT_TRUE(read);
+  EXPECT_NE(read.get(), image.get());
+  EXPECT_EQ(read->column_values(), image->column_values());
+}
+
+TEST_F(DBReactorTest, GetOfAMissingIdIsEmpty) {
+  EXPECT_EQ(reactor->Get<DBImage>(12345), nullptr);
+  EXPECT_EQ(reactor->Get<DBPath>(1), nullptr);
+  EXPECT_EQ(reactor->Get<DBSmartFilter>(1), nullptr);
+  EXPECT_EQ(reactor->Get<DBUserImgAttrib>(1), nullptr);
+  EXPECT_EQ(reactor->Get<DBExivImgAttrib>(1), nullptr);
+}
+
+TEST_F(DBReactorTest, WritingASavedRecordUpdatesIt) {
+  auto image = makeImage(L"a.jpg");
+  image->width = 6000;
+  image->file_size = 1LL << 40;
+  *reactor << image;
+  auto read = reactor->Get<DBImage>(image->id());
+  EXPECT_EQ(read->width, 6000);
+  EXPECT_EQ(read->file_size, 1LL << 40);
+  EXPECT_EQ(reactor->Count<DBImage>(), 1u);
+}
+
+TEST_F(DBReactorTest, WritingThroughTheBaseRecordReachesItsTable) {
+  std::shared_ptr<DBEntity> volume = std::make_shared<DBVolume>();
+  std::static_pointer_cast<DBVolume>(volume)->uuid = L"6F2C-11AA";
+  *reactor << volume;
+  ASSERT_TRUE(volume->is_saved());
+  auto path = makePath(L"Photos", volume->id());
+  auto read = reactor->GetBy<DBVolume, DBPath>(path);
+  ASSERT_TRUE(read);
+  EXPECT_EQ(read->uuid, L"6F2C-11AA");
+}
+
+TEST_F(DBReactorTest, WideTextSurvivesTheFile) {
+  auto image = makeImage(L"\u00c9t\u00e9 \u65e5\u672c \U0001F600.heic");
+  EXPECT_EQ(reactor->Get<DBImage>(image->id())->path, L"\u00c9t\u00e9 \u65e5\u672c \U0001F600.heic");
+}
+
+TEST_F(DBReactorTest, BatchWritesAllRecords) {
+  std::vector<std::shared_ptr<DBImage>> images;
+  for (int i = 0; i < 100; ++i) {
+    images.push_back(std::make_shared<DBImage>());
+    images.back()->import_index = i;
+  }
+  *reactor << images;
+  EXPECT_EQ(reactor->Count<DBImage>(), 100u);
+  EXPECT_EQ(reactor->Get<DBImage>(images[42]->id())->import_index, 42);
+}
+
+TEST_F(DBReactorTest, BatchWithAnEmptyRecordWritesNothing) {
+  std::vector<std::shared_ptr<DBImage>> images{std::make_shared<DBImage>(), nullptr};
+  EXPECT_THROW(*reactor << images, DBException);
+  EXPECT_EQ(reactor->Count<DBImage>(), 0u);
+}
+
+TEST_F(DBReactorTest, BatchThatFailsHalfwayLeavesTheCatalogAsItWas) {
+  auto first = std::make_shared<DBUserImgAttrib>();
+  first->image_id = makeImage(L"a.jpg")->id();
+  auto second = std::make_shared<DBUserImgAttrib>();
+  second->image_id = 999999;  // no such image: the link check fails on the second record
+  EXPECT_THROW((*reactor << std::vector<std::shared_ptr<DBUserImgAttrib>>{first, second}), DBException);
+  EXPECT_EQ(reactor->Get<DBUserImgAttrib>(1), nullptr);
+}
+
+TEST_F(DBReactorTest, ImageAttributesComeUnsavedUntilWritten) {
+  auto image = makeImage(L"a.jpg");
+  auto attributes = reactor->GetBy<DBUserImgAttrib, DBImage>(image);
+  ASSERT_TRUE(attributes);
+  EXPECT_FALSE(attributes->is_saved());
+  EXPECT_EQ(attributes->image_id, image->id());
+  attributes->rating = 4;
+  *reactor << std::vector<std::shared_ptr<DBUserImgAttrib>>{attributes};
+  auto again = reactor->GetBy<DBUserImgAttrib, DBImage>(image);
+  EXPECT_EQ(again->id(), attributes->id());
+  EXPECT_EQ(again->rating, 4);
+  EXPECT_EQ((reactor->GetBy<DBImage, DBUserImgAttrib>(again)->id()), image->id());
+}
+
+TEST_F(DBReactorTest, ExifAttributesLinkBothWays) {
+  auto image = makeImage(L"a.jpg");
+  auto exif = reactor->GetBy<DBExivImgAttrib, DBImage>(image);
+  exif->camera_model = L"X-T5";
+  *reactor << std::vector<std::shared_ptr<DBExivImgAttrib>>{exif};
+  EXPECT_EQ((reactor->GetBy<DBExivImgAttrib, DBImage>(image)->camera_model), L"X-T5");
+  EXPECT_EQ((reactor->GetBy<DBImage, DBExivImgAttrib>(exif)->id()), image->id());
+  EXPECT_EQ((reactor->GetBy<DBExivImgAttrib, DBImage>(nullptr)), nullptr);
+}
+
+TEST_F(DBReactorTest, FavoriteAliasOfAnyRecord) {
+  auto image = makeImage(L"a.jpg");
+  EXPECT_EQ((reactor->GetBy<DBEntityFavoriteAlias, DBEntity>(image)), nullptr);
+  auto alias = std::make_shared<DBEntityFavoriteAlias>();
+  alias->orig_type = image->type();
+  alias->orig_id = image->id();
+  alias->favorite = true;
+  *reactor << alias;
+  auto found = reactor->GetBy<DBEntityFavoriteAlias, DBEntity>(image);
+  ASSERT_TRUE(found);
+  EXPECT_EQ(found->orig_entity_type(), kDBImageType);
+  EXPECT_TRUE(reactor->Remove(image));
+  EXPECT_EQ((reactor->GetBy<DBEntityFavoriteAlias, DBEntity>(image)), nullptr);
+}
+
+TEST_F(DBReactorTest, AttributesOfTreeRecords) {
+  auto filter = makeFilter(L"Trips");
+  EXPECT_EQ((reactor->GetAttributes<DBFilterAttrib, DBFilter>(filter)), nullptr);
+  auto attributes = std::make_shared<DBFilterAttrib>();
+  attributes->filter_id = filter->id();
+  attributes->favorite = true;
+  std::shared_ptr<DBEntity> base = attributes;
+  *reactor << base;
+  auto found = reactor->GetAttributes<DBFilterAttrib, DBFilter>(filter);
+  ASSERT_TRUE(found);
+  EXPECT_TRUE(found->favorite);
+  EXPECT_EQ((reactor->GetAttributes<DBRefFolderAttrib, DBRefFolder>(reactor->GetRoot<DBRefFolder>())),
+            nullptr);
+}
+
+// ---- Failures
+
+TEST_F(DBReactorTest, WriteAfterCloseThrows) {
+  reactor->Close();
+  try {
+    makeImage(L"late.jpg");
+    FAIL() << "no exception";
+  } catch (const DBException& exception) {
+    EXPECT_EQ(exception.code(), DBException::kNoCode);
+    EXPECT_STREQ(exception.what(), "The catalog is not open");
+  }
+  EXPECT_THROW(reactor->Count<DBImage>(), DBException);
+}
+
+TEST_F(DBReactorTest, ReadOnlyFileRefusesWritesWithACode) {
+  makeImage(L"kept.jpg");
+  reactor->Close();
+  std::filesystem::permissions(catalogPath(), std::filesystem::perms::owner_read |
+                                                  std::filesystem::perms::group_read |
+                                                  std::filesystem::perms::others_read);
+  // The superuser writes read-only files: take an ordinary user's rights for this test.
+  KRUnprivilegedUser unprivileged(directory.path());
+  ASSERT_NE(faccessat(AT_FDCWD, catalogPath().c_str(), W_OK, AT_EACCESS), 0);
+  DBReactor readOnly(5);
+  ASSERT_EQ(readOnly.Open(s2ws(catalogPath()), L""), kDBOpenCurrent);
+  EXPECT_EQ(readOnly.Count<DBImage>(), 1u);
+  try {
+    auto image = std::make_shared<DBImage>();
+    readOnly << image;
+    FAIL() << "no exception";
+  } catch (const DBException& exception) {
+    EXPECT_EQ(exception.code() & 0xff, SQLITE_READONLY);
+  }
+  EXPECT_EQ(readOnly.Count<DBImage>(), 1u);
+}
+
+TEST_F(DBReactorTest, FullDiskFailsWithACodeAndWritesNothing) {
+  std::vector<std::shared_ptr<DBImage>> images;
+  for (int i = 0; i < 2000; ++i) {
+    images.push_back(std::make_shared<DBImage>());
+    images.back()->path = std::wstring(200, L'x');
+  }
+  // The file may not grow past its current size: the batch cannot fit.
+  rlimit previous{};
+  getrlimit(RLIMIT_FSIZE, &previous);
+  const auto size = static_cast<rlim_t>(std::filesystem::file_size(catalogPath()) + 4096);
+  rlimit limited{size, previous.rlim_max};
+  std::signal(SIGXFSZ, SIG_IGN);
+  setrlimit(RLIMIT_FSIZE, &limited);
+  bool threw = false;
+  int32_t code = 0;
+  try {
+    *reactor << images;
+  } catch (const DBException& exception) {
+    threw = true;
+    code = exception.code();
+  }
+  setrlimit(RLIMIT_FSIZE, &previous);
+  EXPECT_TRUE(threw);
+  EXPECT_NE(code, DBException::kNoCode);
+  EXPECT_EQ(reactor->Count<DBImage>(), 0u);
+}
+
+// ---- Backup
+
+TEST_F(DBReactorTest, BackupWritesAConsistentCopy) {
+  makeImage(L"a.jpg");
+  makeImage(L"b.jpg");
+  const std::string copy = directory.file("copy.krcatalog");
+  ASSERT_TRUE(reactor->Backup(s2ws(copy)));
+  makeImage(L"c.jpg");
+  DBReactor backup(5);
+  ASSERT_EQ(backup.Open(s2ws(copy), L""), kDBOpenCurrent);
+  EXPECT_EQ(backup.Count<DBImage>(), 2u);
+  EXPECT_EQ(reactor->Count<DBImage>(), 3u);
+}
+
+TEST_F(DBReactorTest, BackupReplacesAnExistingFileAndLeavesNoTemporaryFile) {
+  const std::string copy = directory.file("copy.krcatalog");
+  std::ofstream(copy) << "old content";
+  ASSERT_TRUE(reactor->Backup(s2ws(copy)));
+  EXPECT_EQ(openResult(copy), kDBOpenCurrent);
+  int files = 0;
+  for (const auto& entry : std::filesystem::directory_iterator(directory.path())) {
+    files += entry.path().filename().string().find(".backup-") == std::string::npos ? 0 : 1;
+  }
+  EXPECT_EQ(files, 0);
+}
+
+TEST_F(DBReactorTest, BackupToAMissingFolderFails) {
+  EXPECT_FALSE(reactor->Backup(s2ws(directory.file("missing/copy.krcatalog"))));
+  EXPECT_FALSE(reactor->Backup(L""));
+}

@@ -39,3 +39,5 @@ static void BM_ParallelApply(benchmark::State& state) {
   benchmark::DoNotOptimize(values.data());
 }
 BENCHMARK(BM_ParallelApply);
+
+BENCHMARK_MAIN();

@@ -1,6 +1,10 @@
 # Options shared by every target of the project.
 add_library(kr_compile_options INTERFACE)
 target_compile_options(kr_compile_options INTERFACE -Wall -Wextra)
+# GCC 12 reports false -Wrestrict positives inside std::string concatenation at -O3 (GCC bug 105329).
+if(CMAKE_CXX_COMPILER_ID STREQUAL "GNU" AND CMAKE_CXX_COMPILER_VERSION VERSION_LESS 13)
+  target_compile_options(kr_compile_options INTERFACE -Wno-restrict)
+endif()
 if(KR_WARNINGS_AS_ERRORS)
   target_compile_options(kr_compile_options INTERFACE -Werror)
 endif()

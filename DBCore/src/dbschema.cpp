@@ -140,6 +140,16 @@ const std::vector<MigrationStep>& migrationSteps() {
   return steps;
 }
 
+// Whether SQL compiles against the file's current schema (a fresh statement, never a cached one).
+bool compiles(DBConnection& connection, const std::string& sql) {
+  try {
+    DBStatement probe(connection.handle(), sql);
+    return true;
+  } catch (const DBException&) {
+    return false;
+  }
+}
+
 // Preparing a query over every column of a record table fails when a table or column is missing.
 template <class Record>
 bool hasAllColumns(DBConnection& connection) {
@@ -147,12 +157,7 @@ bool hasAllColumns(DBConnection& connection) {
   for (const auto& column : Record::all_columns()) sql += std::string(column.name) + ",";
   sql.back() = ' ';
   sql += std::string("FROM ") + Record::kTableName + " LIMIT 0";
-  try {
-    connection.prepare(sql);
-    return true;
-  } catch (const DBException&) {
-    return false;
-  }
+  return compiles(connection, sql);
 }
 
 template <class... Records>
@@ -162,8 +167,9 @@ bool haveAllColumns(DBConnection& connection) {
 
 }  // namespace
 
+// The identity mixed with a fixed tag ("KRCT"), one distinct id per identity.
 int32_t DBSchema::applicationIdFor(int32_t appInfo) {
-  return static_cast<int32_t>(0x4B524300u | (static_cast<uint32_t>(appInfo) & 0xFFu));
+  return static_cast<int32_t>(0x4B524354u ^ static_cast<uint32_t>(appInfo));
 }
 
 void DBSchema::migrate(DBConnection& connection, int fromVersion) {
@@ -182,11 +188,7 @@ bool DBSchema::isWellFormed(DBConnection& connection) {
   const char* linkTables[] = {"image_states", "state_resources", "filter_images", "referenced_folder_images",
                               "catalog_info"};
   for (const char* table : linkTables) {
-    try {
-      connection.prepare(std::string("SELECT * FROM ") + table + " LIMIT 0");
-    } catch (const DBException&) {
-      return false;
-    }
+    if (!compiles(connection, std::string("SELECT * FROM ") + table + " LIMIT 0")) return false;
   }
   return haveAllColumns<DBImage, DBPath, DBVolume, DBUserImgAttrib, DBExivImgAttrib, DBImgHistoryState,
                         DBResource, DBFilter, DBFilterAttrib, DBSmartFilter, DBSmartFilterAttrib, DBRefFolder,

@@ -1,5 +1,6 @@
 #include "dbstatement.hpp"
 
+#include "KRFoundation/KRUTF.hpp"
 #include "dbexception.hpp"
 #include "dbstrings.hpp"
 
@@ -54,6 +55,18 @@ DBStatement& DBStatement::bind(int index, const TVariant& value) {
     default:
       return bind(index, value.asInt64());
   }
+}
+
+DBStatement& DBStatement::bindDouble(int index, double value) {
+  const int code = sqlite3_bind_double(statement_, index, value);
+  if (code != SQLITE_OK) fail(code);
+  return *this;
+}
+
+DBStatement& DBStatement::bindWide(int index, const std::wstring& text) {
+  buffer_.clear();
+  KRUTF::appendUTF8(buffer_, text);
+  return bind(index, buffer_);
 }
 
 bool DBStatement::step() {

@@ -1,9 +1,10 @@
 #include "KRFoundation/KRString.hpp"
 
+#include "KRFoundation/KRUTF.hpp"
+
 #include <unicode/coll.h>
 #include <unicode/locid.h>
 #include <unicode/unistr.h>
-#include <unicode/utf8.h>
 
 #include <functional>
 #include <string_view>
@@ -11,19 +12,11 @@
 
 namespace {
 
-constexpr char32_t kReplacementCharacter = 0xFFFD;
-constexpr char32_t kLastCodePoint = 0x10FFFF;
-
 enum class CollationStyle { Localized, Standard };
 
 KRComparisonResult resultOfOrder(int order) {
   if (order < 0) return KROrderedAscending;
   return order > 0 ? KROrderedDescending : KROrderedSame;
-}
-
-bool isScalarValue(wchar_t character) {
-  const auto value = static_cast<uint32_t>(character);
-  return value <= kLastCodePoint && !U_IS_SURROGATE(value);
 }
 
 // The default locale, except the POSIX locale that ICU picks when no locale is configured: its
@@ -115,31 +108,10 @@ bool KRString::operator==(const KRString& other) const {
 
 uint64_t KRString::hash() const { return text_ ? std::hash<std::string>{}(*text_) : 0; }
 
-std::wstring KRString::krs_wstring() const {
-  const std::string& text = str();
-  const auto* bytes = reinterpret_cast<const uint8_t*>(text.data());
-  const size_t length = text.size();
-  std::wstring wide;
-  wide.reserve(length);
-  for (size_t i = 0; i < length;) {
-    UChar32 c;
-    U8_NEXT_OR_FFFD(bytes, i, length, c);
-    wide.push_back(static_cast<wchar_t>(c));
-  }
-  return wide;
-}
+std::wstring KRString::krs_wstring() const { return KRUTF::wideFromUTF8(str()); }
 
 KRString KRString::krs_stringWithWString(const std::wstring& wide) {
-  std::string text;
-  text.reserve(wide.size());
-  for (wchar_t character : wide) {
-    const char32_t c = isScalarValue(character) ? static_cast<char32_t>(character) : kReplacementCharacter;
-    uint8_t encoded[U8_MAX_LENGTH];
-    size_t count = 0;
-    U8_APPEND_UNSAFE(encoded, count, c);
-    text.append(reinterpret_cast<const char*>(encoded), count);
-  }
-  return KRString(std::move(text));
+  return KRString(KRUTF::utf8FromWide(wide));
 }
 
 KRComparisonResult KRString::compare(const KRString& other) const {

@@ -43,10 +43,14 @@ class DBRecord : public DBEntity {
     static const std::vector<DBColumn<Derived>> columns = [] {
       std::vector<DBColumn<Derived>> all{
           {kIdColumn, FieldType::T_INT_64, [](const Derived& r) { return TVariant(r.id()); },
-           [](Derived& r, const TVariant& v) { r.set_id(v.asInt64()); }},
+           [](Derived& r, const TVariant& v) { r.set_id(v.asInt64()); },
+           [](DBStatement& s, int index, const Derived& r) { s.bind(index, r.id()); }},
           {kMarkedToDeleteColumn, FieldType::T_BOOL,
            [](const Derived& r) { return TVariant(r.marked_to_delete()); },
-           [](Derived& r, const TVariant& v) { r.set_marked_to_delete(v.asBool()); }}};
+           [](Derived& r, const TVariant& v) { r.set_marked_to_delete(v.asBool()); },
+           [](DBStatement& s, int index, const Derived& r) {
+             s.bind(index, int64_t{r.marked_to_delete()});
+           }}};
       const auto& own = Derived::columns();
       all.insert(all.end(), own.begin(), own.end());
       return all;

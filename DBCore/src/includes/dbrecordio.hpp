@@ -65,7 +65,7 @@ class DBRecordIO {
   static void write(DBConnection& connection, T& record) {
     DBStatement& statement = connection.prepare(upsertSql<T>());
     int index = 1;
-    for (const auto& column : T::all_columns()) statement.bind(index++, column.get(record));
+    for (const auto& column : T::all_columns()) column.bind(statement, index++, record);
     if (!record.is_saved()) statement.bindNull(1);
     statement.execute();
     if (!record.is_saved()) record.set_id(connection.lastInsertRowId());

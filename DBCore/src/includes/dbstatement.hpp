@@ -22,6 +22,9 @@ class DBStatement {
   DBStatement& bind(int index, int64_t value);
   DBStatement& bind(int index, const std::string& text);
   DBStatement& bind(int index, const TVariant& value);
+  DBStatement& bindDouble(int index, double value);
+  // Binds wide text as UTF-8, converted through a buffer the statement keeps.
+  DBStatement& bindWide(int index, const std::wstring& text);
   DBStatement& bindNull(int index);
 
   // Advances to the next row; false when there are no more rows.
@@ -41,6 +44,7 @@ class DBStatement {
 
   sqlite3* db_;
   sqlite3_stmt* statement_ = nullptr;
+  std::string buffer_;
 };
 
 }  // namespace dbcore

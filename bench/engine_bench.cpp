@@ -1,0 +1,207 @@
+// The storage engine against raw SQLite doing the same work in the same process: a batch import of
+// 100,000 images with their attribute records and folders, and opening a catalog of 1,000,000 images.
+#include <benchmark/benchmark.h>
+#include <sqlite3.h>
+
+#include <chrono>
+#include <cstdio>
+#include <cstdlib>
+#include <filesystem>
+#include <functional>
+#include <string>
+#include <vector>
+
+#include "dbreactor.hpp"
+#include "dbstrings.hpp"
+
+namespace {
+
+constexpr int kImages = 100000;
+constexpr int kFolders = 1000;
+constexpr int kLargeCatalogImages = 1000000;
+
+std::filesystem::path scratchFolder() {
+  static const std::filesystem::path folder = [] {
+    std::string pattern = (std::filesystem::temp_directory_path() / "krbench-XXXXXX").string();
+    if (!mkdtemp(pattern.data())) std::abort();
+    return std::filesystem::path(pattern);
+  }();
+  return folder;
+}
+
+// An initialized, empty catalog at a fresh path.
+std::string emptyCatalog(const std::string& name) {
+  const std::string path = (scratchFolder() / name).string();
+  std::filesystem::remove(path);
+  std::filesystem::remove(path + "-wal");
+  std::filesystem::remove(path + "-shm");
+  dbcore::DBReactor reactor(5);
+  reactor.Open(dbcore::s2ws(path), L"");
+  reactor.Initialize();
+  return path;
+}
+
+std::wstring imageName(int i) { return L"IMG_" + std::to_wstring(i) + L".CR3"; }
+
+void importThroughEngine(const std::string& path) {
+  using namespace dbcore;
+  DBReactor reactor(5);
+  reactor.Open(s2ws(path), L"");
+  std::vector<std::shared_ptr<DBPath>> folders;
+  for (int f = 0; f < kFolders; ++f) {
+    folders.push_back(std::make_shared<DBPath>());
+    folders.back()->path = L"/Photos/Folder " + std::to_wstring(f);
+  }
+  reactor << folders;
+  std::vector<std::shared_ptr<DBImage>> images;
+  for (int i = 0; i < kImages; ++i) {
+    images.push_back(std::make_shared<DBImage>());
+    images.back()->path = imageName(i);
+    images.back()->import_index = i;
+  }
+  reactor << images;
+  std::vector<std::shared_ptr<DBUserImgAttrib>> attributes;
+  std::vector<std::shared_ptr<DBExivImgAttrib>> exif;
+  std::vector<std::pair<std::shared_ptr<DBPath>, std::shared_ptr<DBImage>>> pairs;
+  for (int i = 0; i < kImages; ++i) {
+    attributes.push_back(std::make_shared<DBUserImgAttrib>());
+    attributes.back()->image_id = images[i]->id();
+    attributes.back()->rating = i % 6;
+    exif.push_back(std::make_shared<DBExivImgAttrib>());
+    exif.back()->image_id = images[i]->id();
+    exif.back()->camera_model = L"X-T" + std::to_wstring(i % 5);
+    pairs.emplace_back(folders[i % kFolders], images[i]);
+  }
+  reactor << attributes << exif << pairs;
+}
+
+void execute(sqlite3_stmt* statement) {
+  if (sqlite3_step(statement) != SQLITE_DONE) std::abort();
+  sqlite3_reset(statement);
+}
+
+sqlite3_stmt* prepare(sqlite3* db, const char* sql) {
+  sqlite3_stmt* statement = nullptr;
+  if (sqlite3_prepare_v2(db, sql, -1, &statement, nullptr) != SQLITE_OK) std::abort();
+  return statement;
+}
+
+void bindText(sqlite3_stmt* statement, int index, const std::string& text) {
+  sqlite3_bind_text(statement, index, text.c_str(), static_cast<int>(text.size()), SQLITE_TRANSIENT);
+}
+
+// Every column of the three record tables, as a hand-written importer would insert them: the values the
+// benchmark sets, and zeros or empty texts for the rest.
+constexpr const char* kImageInsert =
+    "INSERT INTO images(marked_to_delete_bool, guid_wide_ch, path_wide_ch, width, height, file_size_int_64, "
+    "modification_date_int_64, import_date_int_64, import_index, creation_date_int_64, folder_path_id) "
+    "VALUES (0, '', ?1, 0, 0, 0, 0, 0, ?2, 0, ?3)";
+constexpr const char* kUserInsert =
+    "INSERT INTO image_user_attributes(marked_to_delete_bool, image_id_int_64, trash_bool, marker, color, "
+    "rating, "
+    "edit_date_int_64, opened_bool, trashed_date_int_64, origin_path_wide_ch, lost_bool, tutorial) "
+    "VALUES (0, ?1, 0, 0, 0, ?2, 0, 0, 0, '', 0, 0)";
+constexpr const char* kExifInsert =
+    "INSERT INTO image_exiv_attributes(marked_to_delete_bool, image_id_int_64, iso_speed, shutter_speed, "
+    "number, "
+    "focal_len, focal_len35mm, ev, focal_len_min, focal_len_max, shutter_min, shutter_max, aperture, "
+    "focus_distance, bits_per_sample, white_balance, white_balance_index, light_source, metering_mode, "
+    "camera_maker_wide_ch, camera_name_wide_ch, camera_model_wide_ch, lens_maker_wide_ch, "
+    "lens_pretty_name_wide_ch, date_time_int_64, is_raw_bool, is_full_filled_bool, version) "
+    "VALUES (0, ?1, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, '', '', ?2, '', '', 0, 0, 0, 0)";
+
+// The same rows written with hand-made prepared statements in one transaction.
+void importThroughRawSqlite(const std::string& path, int imageCount) {
+  sqlite3* db = nullptr;
+  sqlite3_open(path.c_str(), &db);
+  sqlite3_exec(db, "PRAGMA journal_mode = WAL; BEGIN", nullptr, nullptr, nullptr);
+  sqlite3_stmt* folder = prepare(
+      db, "INSERT INTO paths(marked_to_delete_bool, volume_id_int_64, path_wide_ch) VALUES (0, 0, ?)");
+  for (int f = 0; f < kFolders; ++f) {
+    bindText(folder, 1, "/Photos/Folder " + std::to_string(f));
+    execute(folder);
+  }
+  sqlite3_stmt* image = prepare(db, kImageInsert);
+  sqlite3_stmt* user = prepare(db, kUserInsert);
+  sqlite3_stmt* exif = prepare(db, kExifInsert);
+  for (int i = 0; i < imageCount; ++i) {
+    bindText(image, 1, "IMG_" + std::to_string(i) + ".CR3");
+    sqlite3_bind_int(image, 2, i);
+    sqlite3_bind_int64(image, 3, i % kFolders + 1);
+    execute(image);
+    const sqlite3_int64 id = sqlite3_last_insert_rowid(db);
+    sqlite3_bind_int64(user, 1, id);
+    sqlite3_bind_int(user, 2, i % 6);
+    execute(user);
+    sqlite3_bind_int64(exif, 1, id);
+    bindText(exif, 2, "X-T" + std::to_string(i % 5));
+    execute(exif);
+  }
+  for (sqlite3_stmt* statement : {folder, image, user, exif}) sqlite3_finalize(statement);
+  sqlite3_exec(db, "COMMIT", nullptr, nullptr, nullptr);
+  sqlite3_close(db);
+}
+
+double engineSeconds = 0;
+double rawSeconds = 0;
+
+double timed(const std::function<void()>& work) {
+  const auto start = std::chrono::steady_clock::now();
+  work();
+  return std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
+}
+
+void BM_EngineBatchImport(benchmark::State& state) {
+  for (auto _ : state) {
+    state.PauseTiming();
+    const std::string path = emptyCatalog("engine.krcatalog");
+    state.ResumeTiming();
+    const double seconds = timed([&] { importThroughEngine(path); });
+    if (engineSeconds == 0 || seconds < engineSeconds) engineSeconds = seconds;
+  }
+  state.counters["images_per_s"] = kImages / engineSeconds;
+}
+BENCHMARK(BM_EngineBatchImport)->Iterations(3)->Unit(benchmark::kMillisecond);
+
+void BM_RawBatchImport(benchmark::State& state) {
+  for (auto _ : state) {
+    state.PauseTiming();
+    const std::string path = emptyCatalog("raw.krcatalog");
+    state.ResumeTiming();
+    const double seconds = timed([&] { importThroughRawSqlite(path, kImages); });
+    if (rawSeconds == 0 || seconds < rawSeconds) rawSeconds = seconds;
+  }
+  state.counters["images_per_s"] = kImages / rawSeconds;
+}
+BENCHMARK(BM_RawBatchImport)->Iterations(3)->Unit(benchmark::kMillisecond);
+
+// Opening must not scan tables: its time does not grow with the catalog.
+double openMilliseconds() {
+  const std::string path = emptyCatalog("large.krcatalog");
+  importThroughRawSqlite(path, kLargeCatalogImages);
+  double best = 1e9;
+  for (int run = 0; run < 5; ++run) {
+    dbcore::DBReactor reactor(5);
+    const double seconds = timed([&] {
+      if (reactor.Open(dbcore::s2ws(path), L"") != dbcore::kDBOpenCurrent) std::abort();
+    });
+    best = std::min(best, seconds * 1000);
+  }
+  return best;
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+  benchmark::Initialize(&argc, argv);
+  benchmark::RunSpecifiedBenchmarks();
+  benchmark::Shutdown();
+  if (engineSeconds > 0 && rawSeconds > 0) {
+    std::printf("ENGINE_IMAGES_PER_S %.0f\nRAW_IMAGES_PER_S %.0f\n", kImages / engineSeconds,
+                kImages / rawSeconds);
+    std::printf("RATIO engine_batch_import %.3f\n", rawSeconds / engineSeconds);
+  }
+  std::printf("OPEN_MS %.2f\n", openMilliseconds());
+  std::filesystem::remove_all(scratchFolder());
+  return 0;
+}

@@ -79,7 +79,7 @@ bool DBLinks::renamePaths(DBConnection& connection, const std::wstring& oldPath,
 }
 
 void DBLinks::removeFavoriteAlias(DBConnection& connection, const DBEntity& original) {
-  connection.prepare("DELETE FROM favorite_aliases WHERE orig_entity_type = ? AND orig_entity_id_int_64 = ?")
+  connection.prepare("DELETE FROM entity_favorite_aliases WHERE orig_entity_type = ? AND orig_entity_id_int_64 = ?")
       .bind(1, static_cast<int64_t>(original.type()))
       .bind(2, original.id())
       .execute();

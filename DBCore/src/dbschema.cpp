@@ -90,20 +90,20 @@ CREATE TABLE smart_filter_attributes (
   _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
   smart_filter_id_int_64 INTEGER NOT NULL UNIQUE REFERENCES smart_filters(_id_int_64) ON DELETE CASCADE,
   selected_filter_types_wide_ch TEXT NOT NULL DEFAULT '');
-CREATE TABLE referenced_folders (
+CREATE TABLE reffolders (
   _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
   uuid_wide_ch TEXT NOT NULL DEFAULT '', path_id_int_64 INTEGER NOT NULL DEFAULT 0,
   order_float REAL NOT NULL DEFAULT 0,
-  parent_id INTEGER REFERENCES referenced_folders(_id_int_64) ON DELETE CASCADE);
+  parent_id INTEGER REFERENCES reffolders(_id_int_64) ON DELETE CASCADE);
 CREATE TABLE referenced_folder_attributes (
   _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
-  ref_folder_id_int_64 INTEGER NOT NULL UNIQUE REFERENCES referenced_folders(_id_int_64) ON DELETE CASCADE,
+  ref_folder_id_int_64 INTEGER NOT NULL UNIQUE REFERENCES reffolders(_id_int_64) ON DELETE CASCADE,
   favorite_bool INTEGER NOT NULL DEFAULT 0, selected_filter_types_wide_ch TEXT NOT NULL DEFAULT '');
 CREATE TABLE referenced_folder_images (
-  ref_folder_id INTEGER NOT NULL REFERENCES referenced_folders(_id_int_64) ON DELETE CASCADE,
+  ref_folder_id INTEGER NOT NULL REFERENCES reffolders(_id_int_64) ON DELETE CASCADE,
   image_id INTEGER NOT NULL REFERENCES images(_id_int_64) ON DELETE CASCADE,
   PRIMARY KEY (ref_folder_id, image_id)) WITHOUT ROWID;
-CREATE TABLE favorite_aliases (
+CREATE TABLE entity_favorite_aliases (
   _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
   favorite_bool INTEGER NOT NULL DEFAULT 0, favorite_order_float REAL NOT NULL DEFAULT 0,
   orig_entity_type INTEGER NOT NULL DEFAULT 0, orig_entity_id_int_64 INTEGER NOT NULL DEFAULT 0,
@@ -125,8 +125,8 @@ CREATE INDEX state_resources_resource ON state_resources(resource_id);
 CREATE INDEX filters_parent ON filters(parent_id);
 CREATE INDEX filter_images_image ON filter_images(image_id);
 CREATE INDEX smart_filters_parent ON smart_filters(parent_id);
-CREATE INDEX referenced_folders_parent ON referenced_folders(parent_id);
-CREATE INDEX referenced_folders_path ON referenced_folders(path_id_int_64);
+CREATE INDEX reffolders_parent ON reffolders(parent_id);
+CREATE INDEX reffolders_path ON reffolders(path_id_int_64);
 CREATE INDEX referenced_folder_images_image ON referenced_folder_images(image_id);
 )sql";
 
@@ -181,7 +181,7 @@ void DBSchema::migrate(DBConnection& connection, int fromVersion) {
 
 void DBSchema::createRootRecords(DBConnection& connection) {
   connection.exec("INSERT OR IGNORE INTO filters(_id_int_64, parent_id) VALUES (1, NULL)");
-  connection.exec("INSERT OR IGNORE INTO referenced_folders(_id_int_64, parent_id) VALUES (1, NULL)");
+  connection.exec("INSERT OR IGNORE INTO reffolders(_id_int_64, parent_id) VALUES (1, NULL)");
 }
 
 bool DBSchema::isWellFormed(DBConnection& connection) {

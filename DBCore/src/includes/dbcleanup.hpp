@@ -10,7 +10,7 @@ class DBCleanup {
  public:
   static constexpr const char* kDanglingPathsCondition =
       "_id_int_64 NOT IN (SELECT folder_path_id FROM images WHERE folder_path_id IS NOT NULL) "
-      "AND _id_int_64 NOT IN (SELECT path_id_int_64 FROM referenced_folders)";
+      "AND _id_int_64 NOT IN (SELECT path_id_int_64 FROM reffolders)";
   static constexpr const char* kDanglingStatesCondition =
       "_id_int_64 NOT IN (SELECT state_id FROM image_states)";
   static constexpr const char* kDanglingResourcesCondition =

@@ -10,7 +10,7 @@ namespace dbcore {
 // Marks another record as a favorite and gives it a place in the favorites' order.
 class DBEntityFavoriteAlias : public DBRecord<DBEntityFavoriteAlias, kDBEntityFavoriteAliasType> {
  public:
-  static constexpr const char* kTableName = "favorite_aliases";
+  static constexpr const char* kTableName = "entity_favorite_aliases";
   static const std::vector<DBColumn<DBEntityFavoriteAlias>>& columns();
 
   // The record type of the aliased record.

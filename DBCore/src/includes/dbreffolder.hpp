@@ -11,7 +11,7 @@ namespace dbcore {
 // A referenced folder: a folder on disk whose images are in the catalog, one node of its tree.
 class DBRefFolder : public DBRecord<DBRefFolder, kDBRefFolderType> {
  public:
-  static constexpr const char* kTableName = "referenced_folders";
+  static constexpr const char* kTableName = "reffolders";
   static const std::vector<DBColumn<DBRefFolder>>& columns();
 
   std::wstring uuid;

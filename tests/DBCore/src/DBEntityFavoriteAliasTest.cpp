@@ -10,7 +10,7 @@ using dbcore::FieldType;
 
 struct DBEntityFavoriteAliasTraits {
   using Record = dbcore::DBEntityFavoriteAlias;
-  static constexpr const char* kTable = "favorite_aliases";
+  static constexpr const char* kTable = "entity_favorite_aliases";
   static constexpr uint8_t kType = 11;
 
   static auto fields(const Record& record) {

@@ -11,7 +11,7 @@ using dbrecordtest::wideText;
 
 struct DBRefFolderTraits {
   using Record = dbcore::DBRefFolder;
-  static constexpr const char* kTable = "referenced_folders";
+  static constexpr const char* kTable = "reffolders";
   static constexpr uint8_t kType = 7;
 
   static auto fields(const Record& record) { return std::tie(record.uuid, record.path_id, record.order); }

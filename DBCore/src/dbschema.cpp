@@ -110,16 +110,10 @@ CREATE TABLE entity_favorite_aliases (
   UNIQUE (orig_entity_type, orig_entity_id_int_64));
 )sql";
 
-// Version 120: indexes on every link column and on the columns conditions filter on.
+// Version 120: indexes on every link column and on every column that conditions filter on.
 constexpr const char* kCreateIndexes = R"sql(
 CREATE INDEX images_folder ON images(folder_path_id);
-CREATE INDEX images_guid ON images(guid_wide_ch);
-CREATE INDEX images_import_date ON images(import_date_int_64);
 CREATE INDEX paths_volume ON paths(volume_id_int_64, path_wide_ch);
-CREATE INDEX user_attributes_trash ON image_user_attributes(trash_bool);
-CREATE INDEX user_attributes_rating ON image_user_attributes(rating);
-CREATE INDEX exiv_attributes_camera_model ON image_exiv_attributes(camera_model_wide_ch);
-CREATE INDEX exiv_attributes_date ON image_exiv_attributes(date_time_int_64);
 CREATE INDEX image_states_state ON image_states(state_id);
 CREATE INDEX state_resources_resource ON state_resources(resource_id);
 CREATE INDEX filters_parent ON filters(parent_id);
@@ -128,6 +122,44 @@ CREATE INDEX smart_filters_parent ON smart_filters(parent_id);
 CREATE INDEX reffolders_parent ON reffolders(parent_id);
 CREATE INDEX reffolders_path ON reffolders(path_id_int_64);
 CREATE INDEX referenced_folder_images_image ON referenced_folder_images(image_id);
+CREATE INDEX images_marked_to_delete_bool ON images(marked_to_delete_bool);
+CREATE INDEX images_guid_wide_ch ON images(guid_wide_ch);
+CREATE INDEX images_path_wide_ch ON images(path_wide_ch);
+CREATE INDEX images_file_size_int_64 ON images(file_size_int_64);
+CREATE INDEX images_modification_date_int_64 ON images(modification_date_int_64);
+CREATE INDEX images_import_date_int_64 ON images(import_date_int_64);
+CREATE INDEX images_import_index ON images(import_index);
+CREATE INDEX user_attributes_marked_to_delete_bool ON image_user_attributes(marked_to_delete_bool);
+CREATE INDEX user_attributes_trash_bool ON image_user_attributes(trash_bool);
+CREATE INDEX user_attributes_rating ON image_user_attributes(rating);
+CREATE INDEX user_attributes_edit_date_int_64 ON image_user_attributes(edit_date_int_64);
+CREATE INDEX user_attributes_opened_bool ON image_user_attributes(opened_bool);
+CREATE INDEX user_attributes_origin_path_wide_ch ON image_user_attributes(origin_path_wide_ch);
+CREATE INDEX user_attributes_lost_bool ON image_user_attributes(lost_bool);
+CREATE INDEX exiv_attributes_marked_to_delete_bool ON image_exiv_attributes(marked_to_delete_bool);
+CREATE INDEX exiv_attributes_iso_speed ON image_exiv_attributes(iso_speed);
+CREATE INDEX exiv_attributes_shutter_speed ON image_exiv_attributes(shutter_speed);
+CREATE INDEX exiv_attributes_number ON image_exiv_attributes(number);
+CREATE INDEX exiv_attributes_focal_len ON image_exiv_attributes(focal_len);
+CREATE INDEX exiv_attributes_focal_len35mm ON image_exiv_attributes(focal_len35mm);
+CREATE INDEX exiv_attributes_focal_len_min ON image_exiv_attributes(focal_len_min);
+CREATE INDEX exiv_attributes_focal_len_max ON image_exiv_attributes(focal_len_max);
+CREATE INDEX exiv_attributes_shutter_min ON image_exiv_attributes(shutter_min);
+CREATE INDEX exiv_attributes_shutter_max ON image_exiv_attributes(shutter_max);
+CREATE INDEX exiv_attributes_focus_distance ON image_exiv_attributes(focus_distance);
+CREATE INDEX exiv_attributes_bits_per_sample ON image_exiv_attributes(bits_per_sample);
+CREATE INDEX exiv_attributes_white_balance ON image_exiv_attributes(white_balance);
+CREATE INDEX exiv_attributes_white_balance_index ON image_exiv_attributes(white_balance_index);
+CREATE INDEX exiv_attributes_light_source ON image_exiv_attributes(light_source);
+CREATE INDEX exiv_attributes_metering_mode ON image_exiv_attributes(metering_mode);
+CREATE INDEX exiv_attributes_camera_maker_wide_ch ON image_exiv_attributes(camera_maker_wide_ch);
+CREATE INDEX exiv_attributes_camera_name_wide_ch ON image_exiv_attributes(camera_name_wide_ch);
+CREATE INDEX exiv_attributes_camera_model_wide_ch ON image_exiv_attributes(camera_model_wide_ch);
+CREATE INDEX exiv_attributes_lens_maker_wide_ch ON image_exiv_attributes(lens_maker_wide_ch);
+CREATE INDEX exiv_attributes_lens_pretty_name_wide_ch ON image_exiv_attributes(lens_pretty_name_wide_ch);
+CREATE INDEX exiv_attributes_date_time_int_64 ON image_exiv_attributes(date_time_int_64);
+CREATE INDEX exiv_attributes_is_raw_bool ON image_exiv_attributes(is_raw_bool);
+CREATE INDEX exiv_attributes_is_full_filled_bool ON image_exiv_attributes(is_full_filled_bool);
 )sql";
 
 struct MigrationStep {

@@ -42,6 +42,7 @@ class KRDispatchQueue {
  private:
   // What the worker thread shares with the queue; it outlives the queue when the worker is detached.
   struct Worker {
+    explicit Worker(std::string name) : label(std::move(name)) {}
     std::string label;
     KRBlockQueue blocks;
   };

@@ -1,9 +1,10 @@
 #include "KRFoundation/KRStringComparator.hpp"
 
+#include "KRFoundation/KRUTF.hpp"
+
 #include <unicode/normalizer2.h>
 #include <unicode/uchar.h>
 #include <unicode/unistr.h>
-#include <unicode/utf8.h>
 
 namespace {
 
@@ -12,16 +13,8 @@ constexpr char32_t kAnyCharacter = 0x110000;
 constexpr char32_t kAnyRun = 0x110001;
 
 std::u32string codePoints(const std::string& text) {
-  const auto* bytes = reinterpret_cast<const uint8_t*>(text.data());
-  const size_t length = text.size();
-  std::u32string result;
-  result.reserve(length);
-  for (size_t i = 0; i < length;) {
-    UChar32 c;
-    U8_NEXT_OR_FFFD(bytes, i, length, c);
-    result.push_back(static_cast<char32_t>(c));
-  }
-  return result;
+  const std::wstring wide = KRUTF::wideFromUTF8(text);
+  return std::u32string(wide.begin(), wide.end());
 }
 
 std::u32string wildcardPattern(const std::u32string& pattern) {

@@ -80,7 +80,7 @@ class DBTree {
     return false;
   }
 
-  static constexpr int kMaximumDepth = 100000;
+  static constexpr int kMaximumDepth = 10000;
 
  private:
   template <class T>

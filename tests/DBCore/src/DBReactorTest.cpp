@@ -22,9 +22,12 @@ namespace {
 // Runs SQL on a file with plain SQLite, outside the engine, to make fixture files.
 void rawSql(const std::string& path, const std::string& sql) {
   sqlite3* db = nullptr;
-  ASSERT_EQ(sqlite3_open(path.c_str(), &db), SQLITE_OK);
-  ASSERT_EQ(sqlite3_exec(db, sql.c_str(), nullptr, nullptr, nullptr), SQLITE_OK) << sqlite3_errmsg(db);
+  const int opened = sqlite3_open(path.c_str(), &db);
+  const int executed = sqlite3_exec(db, sql.c_str(), nullptr, nullptr, nullptr);
+  const std::string message = sqlite3_errmsg(db);
   sqlite3_close(db);
+  ASSERT_EQ(opened, SQLITE_OK);
+  ASSERT_EQ(executed, SQLITE_OK) << message;
 }
 
 std::vector<std::string> namedIndexes(const std::string& path) {
@@ -134,7 +137,7 @@ TEST_F(DBReactorTest, UnreadablePathFails) {
 
 TEST_F(DBReactorTest, MalformedSchemaFails) {
   reactor->Close();
-  rawSql(catalogPath(), "ALTER TABLE images DROP COLUMN import_index;");
+  rawSql(catalogPath(), "ALTER TABLE images DROP COLUMN width;");
   EXPECT_EQ(openResult(catalogPath()), kDBOpenFailed);
 }
 
@@ -148,6 +151,15 @@ TEST_F(DBReactorTest, InitializeCreatesTheHiddenRoots) {
   EXPECT_EQ(rootFilter->id(), 1);
   EXPECT_EQ(rootFolder->id(), 1);
   EXPECT_EQ(reactor->DBUserVersion(), DBSchema::kCurrentVersion);
+}
+
+TEST_F(DBReactorTest, FileWithoutRootsAnswersNoRoot) {
+  reactor->Close();
+  rawSql(catalogPath(), "DELETE FROM filters; DELETE FROM reffolders;");
+  DBReactor rootless(5);
+  ASSERT_EQ(rootless.Open(s2ws(catalogPath()), L""), kDBOpenCurrent);
+  EXPECT_EQ(rootless.GetRoot<DBFilter>(), nullptr);
+  EXPECT_EQ(rootless.GetRoot<DBRefFolder>(), nullptr);
 }
 
 TEST_F(DBReactorTest, ProductVersionRoundTrips) {

@@ -1,0 +1,107 @@
+#include "dbrecordio.hpp"
+
+#include <gtest/gtest.h>
+
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "DBConnectionTestSupport.hpp"
+#include "dbrecords.hpp"
+
+using namespace dbcore;
+
+namespace {
+
+class DBRecordIOTest : public DBCatalogTestBase {
+ protected:
+  DBPath path(const std::wstring& text, int64_t volumeId = 3) {
+    DBPath record;
+    record.path = text;
+    record.volume_id = volumeId;
+    return record;
+  }
+
+  int64_t pathCount() { return connection->queryInt64("SELECT count(*) FROM paths"); }
+
+  DBStatement& pathsInIdOrder() {
+    return connection->prepare(DBRecordIO::selectSql<DBPath>() + " ORDER BY _id_int_64");
+  }
+};
+
+}  // namespace
+
+TEST_F(DBRecordIOTest, SelectSqlListsEveryColumnOfTheTable) {
+  EXPECT_EQ(DBRecordIO::selectSql<DBPath>(),
+            "SELECT paths._id_int_64,paths.marked_to_delete_bool,paths.volume_id_int_64,paths.path_wide_ch "
+            "FROM paths");
+}
+
+TEST_F(DBRecordIOTest, WriteInsertsThenUpdates) {
+  DBPath record = path(L"Photos");
+  DBRecordIO::write(*connection, record);
+  ASSERT_TRUE(record.is_saved());
+  const int64_t id = record.id();
+  record.path = L"Pictures";
+  record.set_marked_to_delete(true);
+  DBRecordIO::write(*connection, record);
+  EXPECT_EQ(record.id(), id);
+  EXPECT_EQ(pathCount(), 1);
+  const auto read = DBRecordIO::get<DBPath>(*connection, id);
+  ASSERT_TRUE(read);
+  EXPECT_EQ(read->column_values(), record.column_values());
+}
+
+TEST_F(DBRecordIOTest, WriteWithThePresetIdOfAMissingRowInsertsWithThatId) {
+  DBPath record = path(L"Photos");
+  record.set_id(42);
+  DBRecordIO::write(*connection, record);
+  EXPECT_EQ(record.id(), 42);
+  const auto read = DBRecordIO::get<DBPath>(*connection, 42);
+  ASSERT_TRUE(read);
+  EXPECT_EQ(read->path, L"Photos");
+  EXPECT_EQ(pathCount(), 1);
+}
+
+TEST_F(DBRecordIOTest, EveryFieldSurvivesTheFile) {
+  DBImage image;
+  image.guid = L"5D0C";
+  image.path = L"\u00c9t\u00e9 \u65e5\u672c \U0001F600.heic";
+  image.width = 6000;
+  image.height = -1;
+  image.file_size = int64_t{1} << 40;
+  image.modification_date = -86400;
+  image.import_date = 1700000000;
+  image.import_index = 12;
+  image.creation_date = 1600000000;
+  DBRecordIO::write(*connection, image);
+  const auto read = DBRecordIO::get<DBImage>(*connection, image.id());
+  ASSERT_TRUE(read);
+  EXPECT_EQ(read->column_values(), image.column_values());
+}
+
+TEST_F(DBRecordIOTest, RemoveIsTrueOnlyForAStoredRow) {
+  auto record = saved(path(L"Photos"));
+  EXPECT_TRUE(DBRecordIO::remove(*connection, *record));
+  EXPECT_EQ(DBRecordIO::get<DBPath>(*connection, record->id()), nullptr);
+  EXPECT_FALSE(DBRecordIO::remove(*connection, *record));
+}
+
+TEST_F(DBRecordIOTest, ReadOneResetsTheStatement) {
+  const auto first = saved(path(L"a"));
+  saved(path(L"b"));
+  DBStatement& statement = pathsInIdOrder();
+  const auto once = DBRecordIO::readOne<DBPath>(statement);
+  // Without the reset the same statement would go on to the second row.
+  const auto twice = DBRecordIO::readOne<DBPath>(statement);
+  ASSERT_TRUE(once && twice);
+  EXPECT_EQ(once->id(), first->id());
+  EXPECT_EQ(twice->id(), first->id());
+}
+
+TEST_F(DBRecordIOTest, ReadAllResetsTheStatement) {
+  const std::vector<long long> expected{saved(path(L"a"))->id(), saved(path(L"b"))->id()};
+  DBStatement& statement = pathsInIdOrder();
+  EXPECT_EQ(ids(DBRecordIO::readAll<DBPath>(statement)), expected);
+  EXPECT_EQ(ids(DBRecordIO::readAll<DBPath>(statement)), expected);
+}

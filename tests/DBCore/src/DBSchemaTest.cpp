@@ -1,0 +1,142 @@
+#include "dbschema.hpp"
+
+#include <gtest/gtest.h>
+
+#include <map>
+#include <set>
+#include <string>
+#include <tuple>
+
+#include "DBConnectionTestSupport.hpp"
+#include "dbrecords.hpp"
+
+using namespace dbcore;
+
+namespace {
+
+class DBSchemaTest : public DBCatalogTestBase {
+ protected:
+  // The text of the first column of each row of a query (SQL of the test's own).
+  std::set<std::string> queryNames(DBConnection& db, const std::string& sql) {
+    DBStatement& statement = db.prepare(sql);
+    std::set<std::string> names;
+    while (statement.step()) names.insert(statement.columnText(0));
+    statement.reset();
+    return names;
+  }
+
+  std::set<std::string> tableColumns(const std::string& table) {
+    return queryNames(*connection, "SELECT name FROM pragma_table_info('" + table + "')");
+  }
+
+  std::set<std::string> indexNames(DBConnection& db) {
+    return queryNames(db, "SELECT name FROM sqlite_schema WHERE type = 'index' AND sql IS NOT NULL");
+  }
+
+  // SQLite refuses to drop an indexed column: the tests that drop one drop the table's indexes first.
+  void dropIndexesOf(const std::string& table) {
+    for (const auto& index : queryNames(*connection,
+                                        "SELECT name FROM sqlite_schema WHERE type = 'index' AND "
+                                        "sql IS NOT NULL AND tbl_name = '" +
+                                            table + "'"))
+      connection->exec("DROP INDEX " + index);
+  }
+
+  // The record's columns plus the link columns that are no field of the record.
+  template <class Record>
+  static std::set<std::string> expectedColumns() {
+    static const std::map<std::string, std::string> linkColumns{{"images", "folder_path_id"},
+                                                                {"filters", "parent_id"},
+                                                                {"smart_filters", "parent_id"},
+                                                                {DBRefFolder::kTableName, "parent_id"}};
+    std::set<std::string> names;
+    for (const auto& column : Record::all_columns()) names.insert(column.name);
+    const auto link = linkColumns.find(Record::kTableName);
+    if (link != linkColumns.end()) names.insert(link->second);
+    return names;
+  }
+
+  // Checks the columns of every record type's table; returns the names of those tables.
+  template <class... Records>
+  std::set<std::string> expectRecordTables(std::tuple<Records...>*) {
+    (expectRecordTable<Records>(), ...);
+    return {Records::kTableName...};
+  }
+
+  template <class Record>
+  void expectRecordTable() {
+    SCOPED_TRACE(Record::kTableName);
+    EXPECT_EQ(tableColumns(Record::kTableName), expectedColumns<Record>());
+  }
+
+  bool wellFormedAfter(const std::string& sql) {
+    connection->exec(sql);
+    return DBSchema::isWellFormed(*connection);
+  }
+};
+
+}  // namespace
+
+TEST_F(DBSchemaTest, MigrateFromZeroBuildsAWellFormedCatalog) {
+  DBConnection empty(directory.file("empty.db"));
+  EXPECT_FALSE(DBSchema::isWellFormed(empty));
+  empty.transaction([&empty] { DBSchema::migrate(empty, 0); });
+  EXPECT_TRUE(DBSchema::isWellFormed(empty));
+  EXPECT_EQ(empty.queryInt64("PRAGMA user_version"), DBSchema::kCurrentVersion);
+}
+
+TEST_F(DBSchemaTest, MigrateFromTheOldestVersionRunsOnlyTheLaterSteps) {
+  const std::set<std::string> indexes = indexNames(*connection);
+  ASSERT_FALSE(indexes.empty());
+  for (const auto& index : indexes) connection->exec("DROP INDEX " + index);
+  connection->exec("PRAGMA user_version = " + std::to_string(DBSchema::kOldestVersion));
+  connection->transaction([this] { DBSchema::migrate(*connection, DBSchema::kOldestVersion); });
+  EXPECT_EQ(indexNames(*connection), indexes);
+  EXPECT_EQ(connection->queryInt64("PRAGMA user_version"), DBSchema::kCurrentVersion);
+}
+
+TEST_F(DBSchemaTest, NotWellFormedWithoutARecordColumn) {
+  dropIndexesOf("images");
+  EXPECT_FALSE(wellFormedAfter("ALTER TABLE images DROP COLUMN import_index"));
+}
+
+TEST_F(DBSchemaTest, NotWellFormedWithoutARecordTable) {
+  EXPECT_FALSE(wellFormedAfter(std::string("DROP TABLE ") + DBEntityFavoriteAlias::kTableName));
+}
+
+TEST_F(DBSchemaTest, NotWellFormedWithoutALinkTable) {
+  EXPECT_FALSE(wellFormedAfter("DROP TABLE image_states"));
+}
+
+TEST_F(DBSchemaTest, LaterCheckSeesAColumnDroppedAfterAnEarlierOne) {
+  ASSERT_TRUE(DBSchema::isWellFormed(*connection));
+  dropIndexesOf("filters");
+  EXPECT_FALSE(wellFormedAfter("ALTER TABLE filters DROP COLUMN name_wide_ch"));
+}
+
+TEST_F(DBSchemaTest, ApplicationIdIsStableAndDistinctPerAppInfo) {
+  EXPECT_EQ(DBSchema::applicationIdFor(5), DBSchema::applicationIdFor(5));
+  std::set<int32_t> ids;
+  for (int32_t appInfo : {0, 1, 5, 255, 256, 257, 4217, 65541, -1})
+    ids.insert(DBSchema::applicationIdFor(appInfo));
+  EXPECT_EQ(ids.size(), 9u);
+  EXPECT_EQ(ids.count(0), 0u);  // 0 is the id of any plain SQLite file
+}
+
+TEST_F(DBSchemaTest, CreatingTheRootRecordsAgainKeepsOneRootEach) {
+  connection->exec("INSERT INTO filters(_id_int_64, parent_id) VALUES (2, 1)");
+  DBSchema::createRootRecords(*connection);
+  EXPECT_EQ(queryIds("SELECT _id_int_64 FROM filters WHERE parent_id IS NULL"), (std::set<long long>{1}));
+  EXPECT_EQ(queryIds(std::string("SELECT _id_int_64 FROM ") + DBRefFolder::kTableName),
+            (std::set<long long>{1}));
+  EXPECT_EQ(connection->queryInt64("SELECT count(*) FROM filters"), 2);
+}
+
+TEST_F(DBSchemaTest, RecordTablesHaveExactlyTheRecordAndLinkColumns) {
+  const std::set<std::string> recordTables = expectRecordTables(static_cast<DBRecordTypes*>(nullptr));
+  const std::set<std::string> tablesWithIds =
+      queryNames(*connection,
+                 "SELECT m.name FROM sqlite_schema AS m, pragma_table_info(m.name) AS c "
+                 "WHERE m.type = 'table' AND c.name = '_id_int_64'");
+  EXPECT_EQ(tablesWithIds, recordTables);
+}

@@ -3,35 +3,29 @@
 #include <benchmark/benchmark.h>
 #include <sqlite3.h>
 
-#include <chrono>
+#include <algorithm>
 #include <cstdio>
 #include <cstdlib>
 #include <filesystem>
-#include <functional>
 #include <string>
 #include <vector>
 
+#include "KRBenchScratchFolder.hpp"
+#include "KRBenchSqlite.hpp"
 #include "dbreactor.hpp"
 #include "dbstrings.hpp"
 
 namespace {
 
+const KRBenchScratchFolder scratch("krbench");
+
 constexpr int kImages = 100000;
 constexpr int kFolders = 1000;
 constexpr int kLargeCatalogImages = 1000000;
 
-std::filesystem::path scratchFolder() {
-  static const std::filesystem::path folder = [] {
-    std::string pattern = (std::filesystem::temp_directory_path() / "krbench-XXXXXX").string();
-    if (!mkdtemp(pattern.data())) std::abort();
-    return std::filesystem::path(pattern);
-  }();
-  return folder;
-}
-
 // An initialized, empty catalog at a fresh path.
 std::string emptyCatalog(const std::string& name) {
-  const std::string path = (scratchFolder() / name).string();
+  const std::string path = scratch.file(name);
   std::filesystem::remove(path);
   std::filesystem::remove(path + "-wal");
   std::filesystem::remove(path + "-shm");
@@ -75,21 +69,6 @@ void importThroughEngine(const std::string& path) {
   reactor << attributes << exif << pairs;
 }
 
-void execute(sqlite3_stmt* statement) {
-  if (sqlite3_step(statement) != SQLITE_DONE) std::abort();
-  sqlite3_reset(statement);
-}
-
-sqlite3_stmt* prepare(sqlite3* db, const char* sql) {
-  sqlite3_stmt* statement = nullptr;
-  if (sqlite3_prepare_v2(db, sql, -1, &statement, nullptr) != SQLITE_OK) std::abort();
-  return statement;
-}
-
-void bindText(sqlite3_stmt* statement, int index, const std::string& text) {
-  sqlite3_bind_text(statement, index, text.c_str(), static_cast<int>(text.size()), SQLITE_TRANSIENT);
-}
-
 // Every column of the three record tables, as a hand-written importer would insert them: the values the
 // benchmark sets, and zeros or empty texts for the rest.
 constexpr const char* kImageInsert =
@@ -115,27 +94,27 @@ void importThroughRawSqlite(const std::string& path, int imageCount) {
   sqlite3* db = nullptr;
   sqlite3_open(path.c_str(), &db);
   sqlite3_exec(db, "PRAGMA journal_mode = WAL; BEGIN", nullptr, nullptr, nullptr);
-  sqlite3_stmt* folder = prepare(
+  sqlite3_stmt* folder = KRBenchSqlite::prepare(
       db, "INSERT INTO paths(marked_to_delete_bool, volume_id_int_64, path_wide_ch) VALUES (0, 0, ?)");
   for (int f = 0; f < kFolders; ++f) {
-    bindText(folder, 1, "/Photos/Folder " + std::to_string(f));
-    execute(folder);
+    KRBenchSqlite::bindText(folder, 1, "/Photos/Folder " + std::to_string(f));
+    KRBenchSqlite::execute(folder);
   }
-  sqlite3_stmt* image = prepare(db, kImageInsert);
-  sqlite3_stmt* user = prepare(db, kUserInsert);
-  sqlite3_stmt* exif = prepare(db, kExifInsert);
+  sqlite3_stmt* image = KRBenchSqlite::prepare(db, kImageInsert);
+  sqlite3_stmt* user = KRBenchSqlite::prepare(db, kUserInsert);
+  sqlite3_stmt* exif = KRBenchSqlite::prepare(db, kExifInsert);
   for (int i = 0; i < imageCount; ++i) {
-    bindText(image, 1, "IMG_" + std::to_string(i) + ".CR3");
+    KRBenchSqlite::bindText(image, 1, "IMG_" + std::to_string(i) + ".CR3");
     sqlite3_bind_int(image, 2, i);
     sqlite3_bind_int64(image, 3, i % kFolders + 1);
-    execute(image);
+    KRBenchSqlite::execute(image);
     const sqlite3_int64 id = sqlite3_last_insert_rowid(db);
     sqlite3_bind_int64(user, 1, id);
     sqlite3_bind_int(user, 2, i % 6);
-    execute(user);
+    KRBenchSqlite::execute(user);
     sqlite3_bind_int64(exif, 1, id);
-    bindText(exif, 2, "X-T" + std::to_string(i % 5));
-    execute(exif);
+    KRBenchSqlite::bindText(exif, 2, "X-T" + std::to_string(i % 5));
+    KRBenchSqlite::execute(exif);
   }
   for (sqlite3_stmt* statement : {folder, image, user, exif}) sqlite3_finalize(statement);
   sqlite3_exec(db, "COMMIT", nullptr, nullptr, nullptr);
@@ -145,18 +124,12 @@ void importThroughRawSqlite(const std::string& path, int imageCount) {
 double engineSeconds = 0;
 double rawSeconds = 0;
 
-double timed(const std::function<void()>& work) {
-  const auto start = std::chrono::steady_clock::now();
-  work();
-  return std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
-}
-
 void BM_EngineBatchImport(benchmark::State& state) {
   for (auto _ : state) {
     state.PauseTiming();
     const std::string path = emptyCatalog("engine.krcatalog");
     state.ResumeTiming();
-    const double seconds = timed([&] { importThroughEngine(path); });
+    const double seconds = KRBenchSqlite::timed([&] { importThroughEngine(path); });
     if (engineSeconds == 0 || seconds < engineSeconds) engineSeconds = seconds;
   }
   state.counters["images_per_s"] = kImages / engineSeconds;
@@ -168,7 +141,7 @@ void BM_RawBatchImport(benchmark::State& state) {
     state.PauseTiming();
     const std::string path = emptyCatalog("raw.krcatalog");
     state.ResumeTiming();
-    const double seconds = timed([&] { importThroughRawSqlite(path, kImages); });
+    const double seconds = KRBenchSqlite::timed([&] { importThroughRawSqlite(path, kImages); });
     if (rawSeconds == 0 || seconds < rawSeconds) rawSeconds = seconds;
   }
   state.counters["images_per_s"] = kImages / rawSeconds;
@@ -182,7 +155,7 @@ double openMilliseconds() {
   double best = 1e9;
   for (int run = 0; run < 5; ++run) {
     dbcore::DBReactor reactor(5);
-    const double seconds = timed([&] {
+    const double seconds = KRBenchSqlite::timed([&] {
       if (reactor.Open(dbcore::s2ws(path), L"") != dbcore::kDBOpenCurrent) std::abort();
     });
     best = std::min(best, seconds * 1000);
@@ -202,6 +175,5 @@ int main(int argc, char** argv) {
     std::printf("RATIO engine_batch_import %.3f\n", rawSeconds / engineSeconds);
   }
   std::printf("OPEN_MS %.2f\n", openMilliseconds());
-  std::filesystem::remove_all(scratchFolder());
   return 0;
 }

@@ -14,6 +14,7 @@
 #include "dbrecordio.hpp"
 #include "dbrecordvisitor.hpp"
 #include "dbschema.hpp"
+#include "dbselectqueryrunner.hpp"
 #include "dbstates.hpp"
 #include "dbstrings.hpp"
 #include "dbtree.hpp"
@@ -624,5 +625,28 @@ template <>
 unsigned long long DBReactor::Count<DBImage>() const {
   return static_cast<unsigned long long>(connection().queryInt64("SELECT count(*) FROM images"));
 }
+
+// ---- Select queries
+
+template <class T>
+std::vector<std::shared_ptr<T>> DBReactor::GetBySelectQuery(
+    std::shared_ptr<DBEntitySelectQuery> const& query) {
+  return DBSelectQueryRunner::run<T>(connection(), query);
+}
+
+template std::vector<std::shared_ptr<DBImage>> DBReactor::GetBySelectQuery<DBImage>(
+    std::shared_ptr<DBEntitySelectQuery> const&);
+template std::vector<std::shared_ptr<DBPath>> DBReactor::GetBySelectQuery<DBPath>(
+    std::shared_ptr<DBEntitySelectQuery> const&);
+template std::vector<std::shared_ptr<DBVolume>> DBReactor::GetBySelectQuery<DBVolume>(
+    std::shared_ptr<DBEntitySelectQuery> const&);
+template std::vector<std::shared_ptr<DBRefFolder>> DBReactor::GetBySelectQuery<DBRefFolder>(
+    std::shared_ptr<DBEntitySelectQuery> const&);
+template std::vector<std::shared_ptr<DBUserImgAttrib>> DBReactor::GetBySelectQuery<DBUserImgAttrib>(
+    std::shared_ptr<DBEntitySelectQuery> const&);
+template std::vector<std::shared_ptr<DBExivImgAttrib>> DBReactor::GetBySelectQuery<DBExivImgAttrib>(
+    std::shared_ptr<DBEntitySelectQuery> const&);
+template std::vector<std::shared_ptr<DBEntityFavoriteAlias>>
+DBReactor::GetBySelectQuery<DBEntityFavoriteAlias>(std::shared_ptr<DBEntitySelectQuery> const&);
 
 }  // namespace dbcore

@@ -1,0 +1,9 @@
+#include "dbentityreffolderselectquery.hpp"
+
+#include "dbreffolder.hpp"
+
+namespace dbcore {
+
+DBEntityReffolderSelectQuery::DBEntityReffolderSelectQuery() : DBEntitySelectQuery(DBRefFolder::kTableName) {}
+
+}  // namespace dbcore

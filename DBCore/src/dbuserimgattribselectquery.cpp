@@ -1,0 +1,9 @@
+#include "dbuserimgattribselectquery.hpp"
+
+#include "dbuserimgattrib.hpp"
+
+namespace dbcore {
+
+DBUserImgAttribSelectQuery::DBUserImgAttribSelectQuery() : DBEntitySelectQuery(DBUserImgAttrib::kTableName) {}
+
+}  // namespace dbcore

@@ -1,0 +1,25 @@
+#include "KRBenchSqlite.hpp"
+
+#include <chrono>
+#include <cstdlib>
+
+sqlite3_stmt* KRBenchSqlite::prepare(sqlite3* db, const char* sql) {
+  sqlite3_stmt* statement = nullptr;
+  if (sqlite3_prepare_v2(db, sql, -1, &statement, nullptr) != SQLITE_OK) std::abort();
+  return statement;
+}
+
+void KRBenchSqlite::execute(sqlite3_stmt* statement) {
+  if (sqlite3_step(statement) != SQLITE_DONE) std::abort();
+  sqlite3_reset(statement);
+}
+
+void KRBenchSqlite::bindText(sqlite3_stmt* statement, int index, const std::string& text) {
+  sqlite3_bind_text(statement, index, text.c_str(), static_cast<int>(text.size()), SQLITE_TRANSIENT);
+}
+
+double KRBenchSqlite::timed(const std::function<void()>& work) {
+  const auto start = std::chrono::steady_clock::now();
+  work();
+  return std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
+}

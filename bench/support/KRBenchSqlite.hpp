@@ -1,0 +1,18 @@
+#pragma once
+
+#include <sqlite3.h>
+
+#include <functional>
+#include <string>
+
+// What the raw-SQLite baselines of the benchmarks share: statements that abort the run on any failure
+// (a baseline that silently did less work would flatter it), and wall-clock timing.
+class KRBenchSqlite {
+ public:
+  static sqlite3_stmt* prepare(sqlite3* db, const char* sql);
+  // Steps a statement that returns no rows, then resets it.
+  static void execute(sqlite3_stmt* statement);
+  static void bindText(sqlite3_stmt* statement, int index, const std::string& text);
+  // Seconds the work takes.
+  static double timed(const std::function<void()>& work);
+};

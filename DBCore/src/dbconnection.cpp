@@ -43,6 +43,9 @@ void DBConnection::configure() {
   sqlite3_db_config(db_, SQLITE_DBCONFIG_ENABLE_VIEW, 0, nullptr);
   sqlite3_busy_timeout(db_, 5000);
   exec("PRAGMA foreign_keys = ON");
+  // Statement journals (an update of a table with foreign keys keeps one per statement) stay in memory
+  // instead of going through a temporary file page by page.
+  exec("PRAGMA temp_store = MEMORY");
   // Reading the schema here makes a file that is not a database fail now rather than later.
   queryInt64("SELECT count(*) FROM sqlite_schema");
 }

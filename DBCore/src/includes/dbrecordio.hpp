@@ -60,14 +60,17 @@ class DBRecordIO {
     return readOne<T>(statement);
   }
 
-  // Inserts an unsaved record (assigning its id) or replaces the stored values of a saved one.
+  // Inserts an unsaved record (assigning its id) or replaces the stored values of a saved one (inserting
+  // it again under its id when its row is gone). Inserts and updates are separate statements: an upsert
+  // that may rewrite foreign and unique keys makes SQLite journal every page the statement touches.
   template <class T>
   static void write(DBConnection& connection, T& record) {
-    DBStatement& statement = connection.prepare(upsertSql<T>());
-    int index = 1;
-    for (const auto& column : T::all_columns()) column.bind(statement, index++, record);
-    if (!record.is_saved()) statement.bindNull(1);
-    statement.execute();
+    if (record.is_saved()) {
+      writeColumns(connection.prepare(updateSql<T>()), record);
+      if (connection.changes() > 0) return;
+    }
+    DBStatement& statement = connection.prepare(insertSql<T>());
+    writeColumns(statement, record);
     if (!record.is_saved()) record.set_id(connection.lastInsertRowId());
   }
 
@@ -81,23 +84,43 @@ class DBRecordIO {
   }
 
  private:
+  // Binds every column (the id, first, as NULL for an unsaved record) and runs the statement.
   template <class T>
-  static const std::string& upsertSql() {
+  static void writeColumns(DBStatement& statement, const T& record) {
+    int index = 1;
+    for (const auto& column : T::all_columns()) column.bind(statement, index++, record);
+    if (!record.is_saved()) statement.bindNull(1);
+    statement.execute();
+  }
+
+  template <class T>
+  static const std::string& insertSql() {
     static const std::string sql = [] {
       std::string names;
       std::string values;
-      std::string updates;
       for (const auto& column : T::all_columns()) {
         names += std::string(column.name) + ",";
         values += "?,";
-        if (std::string(column.name) != kIdColumn)
-          updates += std::string(column.name) + "=excluded." + column.name + ",";
       }
       names.pop_back();
       values.pop_back();
-      updates.pop_back();
-      return std::string("INSERT INTO ") + T::kTableName + "(" + names + ") VALUES(" + values +
-             ") ON CONFLICT(_id_int_64) DO UPDATE SET " + updates;
+      return std::string("INSERT INTO ") + T::kTableName + "(" + names + ") VALUES(" + values + ")";
+    }();
+    return sql;
+  }
+
+  // Parameters numbered as in insertSql(): the id is ?1.
+  template <class T>
+  static const std::string& updateSql() {
+    static const std::string sql = [] {
+      std::string assignments;
+      int index = 0;
+      for (const auto& column : T::all_columns()) {
+        ++index;
+        if (index > 1) assignments += std::string(column.name) + "=?" + std::to_string(index) + ",";
+      }
+      assignments.pop_back();
+      return std::string("UPDATE ") + T::kTableName + " SET " + assignments + " WHERE " + kIdColumn + "=?1";
     }();
     return sql;
   }

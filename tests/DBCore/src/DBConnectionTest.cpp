@@ -138,6 +138,11 @@ TEST_F(DBConnectionTest, ForeignKeysAreEnforced) {
   }
 }
 
+TEST_F(DBConnectionTest, TemporaryStorageStaysInMemory) {
+  // 2 is MEMORY: statement journals never go through a temporary file.
+  EXPECT_EQ(connection->queryInt64("PRAGMA temp_store"), 2);
+}
+
 TEST_F(DBConnectionTest, OpeningADirectoryThrowsWithACode) {
   try {
     DBConnection opened(directory.path().string());

@@ -14,7 +14,6 @@
 #include <string>
 #include <vector>
 
-#include "KRBenchScratchFolder.hpp"
 #include "KRBenchSqlite.hpp"
 #include "KRFoundation/KRConcurrentQueue.hpp"
 #include "dbclause.hpp"
@@ -23,10 +22,11 @@
 #include "dbreactor.hpp"
 #include "dbstrings.hpp"
 #include "dbuserimgattribselectquery.hpp"
+#include "support/KRTemporaryDirectory.hpp"
 
 namespace {
 
-const KRBenchScratchFolder scratch("krcondbench");
+const KRTemporaryDirectory scratch;
 
 constexpr int kImages = 1000000;
 constexpr int kModels = 5;

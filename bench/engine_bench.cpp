@@ -10,14 +10,14 @@
 #include <string>
 #include <vector>
 
-#include "KRBenchScratchFolder.hpp"
 #include "KRBenchSqlite.hpp"
 #include "dbreactor.hpp"
 #include "dbstrings.hpp"
+#include "support/KRTemporaryDirectory.hpp"
 
 namespace {
 
-const KRBenchScratchFolder scratch("krbench");
+const KRTemporaryDirectory scratch;
 
 constexpr int kImages = 100000;
 constexpr int kFolders = 1000;

@@ -29,7 +29,6 @@ namespace {
 const KRTemporaryDirectory scratch;
 
 constexpr int kImages = 1000000;
-constexpr int kModels = 5;
 constexpr const char* kModel = "X-T2";
 constexpr int kEvaluationThreads = 2;
 constexpr int kEvaluationRounds = 5;
@@ -57,13 +56,7 @@ void buildCatalog() {
     KRBenchSqlite::bindText(image, 2, "IMG_" + std::to_string(i) + ".CR3");
     sqlite3_bind_int(image, 3, i);
     KRBenchSqlite::execute(image);
-    const sqlite3_int64 id = sqlite3_last_insert_rowid(db);
-    sqlite3_bind_int64(user, 1, id);
-    sqlite3_bind_int(user, 2, i % 6);
-    KRBenchSqlite::execute(user);
-    sqlite3_bind_int64(exif, 1, id);
-    KRBenchSqlite::bindText(exif, 2, "X-T" + std::to_string(i % kModels));
-    KRBenchSqlite::execute(exif);
+    KRBenchSqlite::insertAttributes(user, exif, sqlite3_last_insert_rowid(db), i);
   }
   for (sqlite3_stmt* statement : {image, user, exif}) sqlite3_finalize(statement);
   sqlite3_exec(db, "COMMIT; PRAGMA wal_checkpoint(TRUNCATE)", nullptr, nullptr, nullptr);

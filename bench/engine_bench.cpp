@@ -108,13 +108,7 @@ void importThroughRawSqlite(const std::string& path, int imageCount) {
     sqlite3_bind_int(image, 2, i);
     sqlite3_bind_int64(image, 3, i % kFolders + 1);
     KRBenchSqlite::execute(image);
-    const sqlite3_int64 id = sqlite3_last_insert_rowid(db);
-    sqlite3_bind_int64(user, 1, id);
-    sqlite3_bind_int(user, 2, i % 6);
-    KRBenchSqlite::execute(user);
-    sqlite3_bind_int64(exif, 1, id);
-    KRBenchSqlite::bindText(exif, 2, "X-T" + std::to_string(i % 5));
-    KRBenchSqlite::execute(exif);
+    KRBenchSqlite::insertAttributes(user, exif, sqlite3_last_insert_rowid(db), i);
   }
   for (sqlite3_stmt* statement : {folder, image, user, exif}) sqlite3_finalize(statement);
   sqlite3_exec(db, "COMMIT", nullptr, nullptr, nullptr);

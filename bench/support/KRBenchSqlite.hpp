@@ -13,6 +13,9 @@ class KRBenchSqlite {
   // Steps a statement that returns no rows, then resets it.
   static void execute(sqlite3_stmt* statement);
   static void bindText(sqlite3_stmt* statement, int index, const std::string& text);
+  // The attribute rows of the benchmarks' catalogs for image number `i`: rating i % 6 and camera model
+  // "X-T" + i % 5. `user` and `exif` insert (image id, rating) and (image id, camera model).
+  static void insertAttributes(sqlite3_stmt* user, sqlite3_stmt* exif, sqlite3_int64 imageId, int i);
   // Seconds the work takes.
   static double timed(const std::function<void()>& work);
 };

@@ -24,12 +24,26 @@ DBSqlValue DBSqlRow::storedValue(const TVariant& variant, std::string& text) {
   }
 }
 
-DBSqlRow::DBSqlRow(const std::vector<DBSqlValue>& values) : size_(values.size()) {
+std::vector<DBSqlValue> DBSqlRow::storedValues(const std::vector<TVariant>& variants,
+                                               std::vector<std::string>& texts) {
+  texts.assign(variants.size(), std::string());
+  std::vector<DBSqlValue> values;
+  values.reserve(variants.size());
+  for (std::size_t index = 0; index < variants.size(); ++index) {
+    values.push_back(storedValue(variants[index], texts[index]));
+  }
+  return values;
+}
+
+std::size_t DBSqlRow::blockSize(std::span<const DBSqlValue> values) {
   std::size_t textBytes = 0;
   for (const DBSqlValue& value : values) textBytes += value.viewsText() ? value.asText().size() : 0;
-  block_ = std::make_unique_for_overwrite<std::byte[]>(size_ * sizeof(DBSqlValue) + textBytes);
-  auto* cursor = reinterpret_cast<char*>(block_.get() + size_ * sizeof(DBSqlValue));
-  for (std::size_t index = 0; index < size_; ++index) {
+  return values.size() * sizeof(DBSqlValue) + textBytes;
+}
+
+void DBSqlRow::writeBlock(std::span<const DBSqlValue> values, std::byte* block) {
+  auto* cursor = reinterpret_cast<char*>(block + values.size() * sizeof(DBSqlValue));
+  for (std::size_t index = 0; index < values.size(); ++index) {
     DBSqlValue value = values[index];
     if (value.viewsText()) {
       const std::string_view text = value.asText();
@@ -37,18 +51,18 @@ DBSqlRow::DBSqlRow(const std::vector<DBSqlValue>& values) : size_(values.size())
       value = DBSqlValue::text(std::string_view(cursor, text.size()));
       cursor += text.size();
     }
-    new (block_.get() + index * sizeof(DBSqlValue)) DBSqlValue(value);
+    new (block + index * sizeof(DBSqlValue)) DBSqlValue(value);
   }
 }
 
+DBSqlRow::DBSqlRow(const std::vector<DBSqlValue>& values)
+    : block_(std::make_unique_for_overwrite<std::byte[]>(blockSize(values))), size_(values.size()) {
+  writeBlock(values, block_.get());
+}
+
 DBSqlRow::DBSqlRow(const std::vector<TVariant>& variants) {
-  std::vector<std::string> texts(variants.size());
-  std::vector<DBSqlValue> values;
-  values.reserve(variants.size());
-  for (std::size_t index = 0; index < variants.size(); ++index) {
-    values.push_back(storedValue(variants[index], texts[index]));
-  }
-  *this = DBSqlRow(values);
+  std::vector<std::string> texts;
+  *this = DBSqlRow(storedValues(variants, texts));
 }
 
 bool DBSqlRow::holdsSameValues(const DBSqlRow& other) const {

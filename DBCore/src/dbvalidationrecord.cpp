@@ -1,7 +1,9 @@
 #include "dbvalidationrecord.hpp"
 
 #include <map>
+#include <new>
 #include <tuple>
+#include <type_traits>
 
 #include "dbrecords.hpp"
 
@@ -36,24 +38,37 @@ const std::vector<DBValidationRecord::RelatedTable>& DBValidationRecord::related
   return found == related.end() ? none : found->second;
 }
 
+// One allocation holds the record and, behind it, its values and their texts. The values are trivially
+// destructible, so the deleter only releases the memory.
 std::shared_ptr<const DBValidationRecord> DBValidationRecord::make(const DBEntity& record,
                                                                    const DBRelatedRecordResolver& resolver) {
-  return std::make_shared<const DBValidationRecord>(Key{}, record, resolver);
+  const Rows rows = rowsOf(record, resolver);
+  std::vector<std::string> texts;
+  const std::vector<DBSqlValue> values = DBSqlRow::storedValues(rows.values, texts);
+  static_assert(std::is_trivially_destructible_v<DBSqlValue> && std::is_trivially_destructible_v<Slot>);
+  void* memory = ::operator new(sizeof(DBValidationRecord) + DBSqlRow::blockSize(values));
+  auto* made = new (memory) DBValidationRecord(record.table_name(), record.id(), rows.slots);
+  DBSqlRow::writeBlock(values, reinterpret_cast<std::byte*>(made + 1));
+  return std::shared_ptr<const DBValidationRecord>(made, [](const DBValidationRecord* done) {
+    done->~DBValidationRecord();
+    ::operator delete(const_cast<DBValidationRecord*>(done));
+  });
 }
 
-DBValidationRecord::DBValidationRecord(Key, const DBEntity& record, const DBRelatedRecordResolver& resolver)
-    : table_(record.table_name()), id_(record.id()) {
-  std::vector<TVariant> all;
-  all.reserve(kMaxRowValues);
-  addRow(0, table_, record.column_values(), all);
-  const auto& related = relatedTables(table_);
+DBValidationRecord::Rows DBValidationRecord::rowsOf(const DBEntity& record,
+                                                    const DBRelatedRecordResolver& resolver) {
+  Rows rows;
+  rows.values.reserve(kMaxRowValues);
+  const char* table = record.table_name();
+  addRow(rows, 0, table, record.column_values());
+  const auto& related = relatedTables(table);
   for (std::size_t index = 0; index < related.size() && index + 1 < kMaxSlots; ++index) {
     const std::shared_ptr<DBEntity> other = resolver ? resolver(record, related[index].table) : nullptr;
     const ColumnValues values = other ? other->column_values() : ColumnValues{};
     if (isRelated(record, related[index], other, values))
-      addRow(index + 1, related[index].table, values, all);
+      addRow(rows, index + 1, related[index].table, values);
   }
-  values_ = DBSqlRow(all);
+  return rows;
 }
 
 // The names of the table's columns in order, read once per table.
@@ -71,14 +86,13 @@ const std::vector<std::string>& DBValidationRecord::columnNames(const char* tabl
 }
 
 // Every column of the table, in column-name order; a column the values lack is NULL.
-void DBValidationRecord::addRow(std::size_t slot, const char* table, const ColumnValues& values,
-                                std::vector<TVariant>& all) {
-  slots_[slot] = {static_cast<uint32_t>(all.size()), 0, true};
+void DBValidationRecord::addRow(Rows& rows, std::size_t slot, const char* table, const ColumnValues& values) {
+  const auto offset = static_cast<uint32_t>(rows.values.size());
   for (const std::string& column : columnNames(table)) {
     const auto found = values.find(column);
-    all.push_back(found == values.end() ? TVariant() : found->second);
+    rows.values.push_back(found == values.end() ? TVariant() : found->second);
   }
-  slots_[slot].size = static_cast<uint32_t>(all.size()) - slots_[slot].offset;
+  rows.slots[slot] = {offset, static_cast<uint32_t>(rows.values.size()) - offset, true};
 }
 
 // Whether the other record (with its values) is of the related table and linked to the record.

@@ -29,6 +29,15 @@ class DBSqlRow {
 
   // The value SQLite stores for a variant (see above); a text is put into `text`, which the value views.
   static DBSqlValue storedValue(const TVariant& variant, std::string& text);
+  // The stored values of the variants; `texts` keeps the texts they view.
+  static std::vector<DBSqlValue> storedValues(const std::vector<TVariant>& variants,
+                                              std::vector<std::string>& texts);
+
+  // The bytes a block of the values takes: the values, then the bytes of the texts they view.
+  static std::size_t blockSize(std::span<const DBSqlValue> values);
+  // Writes the values into `block` (blockSize bytes, aligned for DBSqlValue) with their texts copied
+  // behind them, so that the block's values view only the block.
+  static void writeBlock(std::span<const DBSqlValue> values, std::byte* block);
 
   std::size_t size() const { return size_; }
   // The value at the index; NULL past the end.

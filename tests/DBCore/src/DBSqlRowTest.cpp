@@ -54,3 +54,18 @@ TEST(DBSqlRowTest, HoldsSameValuesComparesClassesAndValues) {
   EXPECT_FALSE(base.holdsSameValues(row({DBSqlValue::integer(3), DBSqlValue()})));
   EXPECT_TRUE(DBSqlRow().holdsSameValues(row({})));
 }
+
+TEST(DBSqlRowTest, WriteBlockCopiesTextsBehindTheValues) {
+  const std::string longText = "a text longer than the inline room";
+  const std::vector<DBSqlValue> values = {DBSqlValue::text(longText), DBSqlValue::text("short"),
+                                          DBSqlValue::real(2.5)};
+  const std::size_t size = DBSqlRow::blockSize(values);
+  EXPECT_EQ(size, 3 * sizeof(DBSqlValue) + longText.size());
+  std::vector<DBSqlValue> block(size / sizeof(DBSqlValue) + 1);
+  auto* bytes = reinterpret_cast<std::byte*>(block.data());
+  DBSqlRow::writeBlock(values, bytes);
+  EXPECT_EQ(block[0].asText(), longText);
+  EXPECT_EQ(reinterpret_cast<const std::byte*>(block[0].asText().data()), bytes + 3 * sizeof(DBSqlValue));
+  EXPECT_EQ(block[1].asText(), "short");
+  EXPECT_EQ(block[2].asReal(), 2.5);
+}

@@ -98,3 +98,21 @@ TEST(DBValidationRecordTest, OtherTablesHaveOnlyTheirOwnRow) {
   EXPECT_EQ(record->value(0, rankOf("paths", "path_wide_ch")).asText(), "/a/b");
   EXPECT_FALSE(record->hasRow(1));
 }
+
+TEST(DBValidationRecordTest, OwnsItsTextsAfterTheRecordsAreGone) {
+  std::shared_ptr<const DBValidationRecord> record;
+  {
+    auto source = image(9);
+    source->path = L"/Volumes/Photos/2026/a rather long file name \u00e9.CR3";
+    const auto user = userAttributes(9, 2);
+    user->origin_name = L"an origin name longer than eight bytes";
+    record = DBValidationRecord::make(*source, [&](const DBEntity&, const std::string& table) {
+      return table == "image_user_attributes" ? std::static_pointer_cast<DBEntity>(user) : nullptr;
+    });
+  }
+  EXPECT_EQ(record->value(0, rankOf("images", "path_wide_ch")).asText(),
+            "/Volumes/Photos/2026/a rather long file name \xc3\xa9.CR3");
+  EXPECT_EQ(record->value(1, rankOf("image_user_attributes", "origin_path_wide_ch")).asText(),
+            "an origin name longer than eight bytes");
+  EXPECT_EQ(record->value(1, rankOf("image_user_attributes", "rating")).asInteger(), 2);
+}

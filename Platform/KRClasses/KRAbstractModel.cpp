@@ -1,9 +1,8 @@
 #include "KRClasses/KRAbstractModel.hpp"
 
 #include <algorithm>
-#include <condition_variable>
-#include <exception>
 
+#include "KRFoundation/KRBlockWaiter.hpp"
 #include "KRFoundation/KRRunLoop.hpp"
 
 namespace {
@@ -60,23 +59,9 @@ void KRAbstractModel::performMainThreadBlock(const std::function<void()>& block)
     block();
     return;
   }
-  std::mutex mutex;
-  std::condition_variable finished;
-  bool done = false;
-  std::exception_ptr failure;
-  KRRunLoop::mainRunLoop()->performBlock([&] {
-    try {
-      block();
-    } catch (...) {
-      failure = std::current_exception();
-    }
-    std::lock_guard lock(mutex);
-    done = true;
-    finished.notify_one();
-  });
-  std::unique_lock lock(mutex);
-  finished.wait(lock, [&] { return done; });
-  if (failure) std::rethrow_exception(failure);
+  KRBlockWaiter::postAndWait(
+      [](std::function<void()> wrapper) { KRRunLoop::mainRunLoop()->performBlock(std::move(wrapper)); },
+      block);
 }
 
 void KRAbstractModel::asyncPerformMainThreadBlock(std::function<void()> block) {

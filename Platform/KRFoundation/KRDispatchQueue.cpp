@@ -1,8 +1,9 @@
 #include "KRFoundation/KRDispatchQueue.hpp"
 
-#include <condition_variable>
 #include <cstdio>
 #include <mutex>
+
+#include "KRFoundation/KRBlockWaiter.hpp"
 
 namespace {
 
@@ -30,18 +31,6 @@ std::string describe(const std::exception_ptr& error) {
 void writeToStandardError(const std::string& label, const std::exception_ptr& error) {
   const std::string line = "uncaught exception on queue " + label + ": " + describe(error) + "\n";
   std::fputs(line.c_str(), stderr);
-}
-
-// Runs the block; returns its exception, already out of the catch handler so that the worker holds no
-// reference to it once handed over.
-std::exception_ptr runCatching(const std::function<void()>& block) {
-  std::exception_ptr error;
-  try {
-    block();
-  } catch (...) {
-    error = std::current_exception();
-  }
-  return error;
 }
 
 // The worker data of the queue whose block runs on this thread.
@@ -74,21 +63,7 @@ void KRDispatchQueue::sync(const std::function<void()>& block) {
     block();
     return;
   }
-  std::mutex mutex;
-  std::condition_variable finished;
-  bool done = false;
-  std::exception_ptr error;
-  async([&] {
-    std::exception_ptr caught = runCatching(block);
-    // Notifying under the lock keeps the waiter, whose stack holds all of this, from leaving early.
-    std::lock_guard lock(mutex);
-    error = std::move(caught);
-    done = true;
-    finished.notify_one();
-  });
-  std::unique_lock lock(mutex);
-  finished.wait(lock, [&done] { return done; });
-  if (error) std::rethrow_exception(std::move(error));
+  KRBlockWaiter::postAndWait([this](std::function<void()> wrapper) { async(std::move(wrapper)); }, block);
 }
 
 bool KRDispatchQueue::isCurrent() const { return tCurrentWorker == worker_.get(); }

@@ -1,12 +1,26 @@
 #include "KRFoundation/KRCompoundPredicate.hpp"
 
 #include <algorithm>
+#include <string>
 
 #include "KRFoundation/KRException.hpp"
 #include "KRFoundation/KRHashing.hpp"
 
+namespace {
+
+bool isKnownType(KRCompoundPredicate::Type type) {
+  using Type = KRCompoundPredicate::Type;
+  return type == Type::Not || type == Type::And || type == Type::Or;
+}
+
+}  // namespace
+
 std::shared_ptr<KRCompoundPredicate> KRCompoundPredicate::predicateWithType(
     Type type, std::vector<KRPredicatePtr> subpredicates) {
+  if (!isKnownType(type)) {
+    KRException::raise(KRException::NSInvalidArgumentException,
+                       "Unknown compound predicate type " + std::to_string(static_cast<int>(type)));
+  }
   if (std::find(subpredicates.begin(), subpredicates.end(), nullptr) != subpredicates.end()) {
     KRException::raise(KRException::NSInvalidArgumentException,
                        "A compound predicate has an empty subpredicate");

@@ -11,7 +11,8 @@ class KRCompoundPredicate : public KRPredicate {
  public:
   enum class Type { Not, And, Or };
 
-  // Raise NSInvalidArgumentException for an empty subpredicate, and for NOT without exactly one.
+  // Raise NSInvalidArgumentException for a type other than NOT, AND and OR, for an empty subpredicate,
+  // and for NOT without exactly one.
   static std::shared_ptr<KRCompoundPredicate> predicateWithType(Type type,
                                                                 std::vector<KRPredicatePtr> subpredicates);
   static std::shared_ptr<KRCompoundPredicate> andPredicateWithSubpredicates(

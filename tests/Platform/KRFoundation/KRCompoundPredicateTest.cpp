@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <string>
 #include <vector>
 
 #include "KRFoundation/KRException.hpp"
@@ -75,6 +76,20 @@ TEST(KRCompoundPredicateTest, FactoriesRejectMissingSubpredicates) {
   EXPECT_THROW(KRCompoundPredicate::andPredicateWithSubpredicates({nullptr}), KRException);
   EXPECT_THROW(KRCompoundPredicate::notPredicateWithSubpredicate(nullptr), KRException);
   EXPECT_THROW(KRCompoundPredicate::predicateWithType(KRCompoundPredicate::Type::Not, {}), KRException);
+}
+
+TEST(KRCompoundPredicateTest, FactoriesRejectUnknownTypes) {
+  for (const int value : {-1, 3, 42}) {
+    SCOPED_TRACE(value);
+    try {
+      KRCompoundPredicate::predicateWithType(static_cast<KRCompoundPredicate::Type>(value),
+                                             {format("a == 1"), format("b == 2")});
+      ADD_FAILURE() << "no exception";
+    } catch (const KRException& exception) {
+      EXPECT_EQ(exception.name(), KRString(KRException::NSInvalidArgumentException));
+      EXPECT_NE(exception.reason().str().find("Unknown compound predicate type"), std::string::npos);
+    }
+  }
 }
 
 TEST(KRCompoundPredicateTest, EqualityComparesTypeAndSubpredicatesInOrder) {

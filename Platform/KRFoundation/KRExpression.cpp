@@ -116,14 +116,21 @@ std::string valueFormat(const KRValue& value) {
   }
 }
 
-// Components spelled like keywords get the "#" escape.
+// A key as one token: plain names as they are, names spelled like keywords after "#", and any other
+// name (spaces, punctuation, a leading digit, the empty name) as a quoted "#" key.
+std::string keyFormat(const std::string& key) {
+  if (KRPredicateLexer::isReservedWord(key)) return "#" + key;
+  return KRPredicateLexer::isPlainName(key) ? key : "#" + quoted(key);
+}
+
+// A key path starting with the key "SELF" is written after "SELF.", which reading drops again; read on
+// its own, that first key would mean the evaluated object.
 std::string keyPathFormat(const std::string& keyPath) {
-  std::string text;
+  std::string text = keyPath == "SELF" || keyPath.starts_with("SELF.") ? "SELF." : "";
   size_t start = 0;
   while (true) {
     const size_t dot = keyPath.find('.', start);
-    const std::string component = keyPath.substr(start, dot - start);
-    text += (KRPredicateLexer::isReservedWord(component) ? "#" : "") + component;
+    text += keyFormat(keyPath.substr(start, dot - start));
     if (dot == std::string::npos) return text;
     text += ".";
     start = dot + 1;

@@ -16,7 +16,8 @@
 // Format syntax (expressionWithFormat):
 // - numbers (12, 1.5, 2e3), strings ('x', "x"), YES/NO/TRUE/FALSE, NIL/NULL, CAST(seconds, "NSDate")
 //   (seconds since 2001-01-01 UTC, as the platform writes dates), array literals {a, b};
-// - key paths (a.b.c, "#key" for a key spelled like a keyword), SELF and SELF.a.b, variables $name;
+// - key paths (a.b.c, "#key" for a key spelled like a keyword, "#'any key'" for a key that is not a
+//   word, such as "#'first name'" or "#''"), SELF and SELF.a.b, variables $name;
 // - arithmetic: + - * / and ** (power, right-associative, binding tighter than a unary minus on its
 //   left: -2 ** 2 is -4), unary minus, parentheses;
 // - FUNCTION(receiver, 'name'): calls the function registered under the name with the receiver's value;
@@ -75,9 +76,11 @@ class KRExpression : public KRObject {
   size_t height() const { return height_; }
 
   KRValue expressionValueWithObject(const KRValue& object, const KRDictionary& context = {}) const;
-  // A format that parses back to an equal expression. Exceptions: constants without a literal form
-  // (dictionaries, objects, NaN) are written as their description, strings that are not valid UTF-8
-  // keep their bytes, and sets are written as array literals (parsing back to arrays).
+  // A format that parses back to an equal expression. Keys that are not plain names are escaped, so
+  // every key path reads back, the empty one included (%K refuses an empty key path, but a key path
+  // made here may be empty or hold empty keys). Exceptions: constants without a literal form
+  // (dictionaries, objects, NaN) are written as their description, strings and keys that are not valid
+  // UTF-8 keep their bytes, and sets are written as array literals (parsing back to arrays).
   std::string expressionFormat() const;
   std::string description() const override { return expressionFormat(); }
   bool isEqual(const std::shared_ptr<const KRObject>& other) const override;

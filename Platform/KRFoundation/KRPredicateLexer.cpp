@@ -47,6 +47,8 @@ bool isWordCharacter(char c) {
 
 bool isWordStart(char c) { return isWordCharacter(c) && !isDigit(c); }
 
+bool isQuote(char c) { return c == '\'' || c == '"'; }
+
 std::string upperCased(std::string_view word) {
   std::string upper(word);
   std::transform(upper.begin(), upper.end(), upper.begin(),
@@ -126,6 +128,11 @@ bool KRPredicateLexer::isReservedWord(std::string_view word) {
   return std::find(kReservedWords.begin(), kReservedWords.end(), upper) != kReservedWords.end();
 }
 
+bool KRPredicateLexer::isPlainName(std::string_view name) {
+  if (name.starts_with('@')) name.remove_prefix(1);
+  return !name.empty() && isWordStart(name.front()) && std::all_of(name.begin(), name.end(), isWordCharacter);
+}
+
 void KRPredicateLexer::raiseParseError(const std::string& format, size_t position,
                                        const std::string& detail) {
   KRException::raise(KRException::NSInvalidArgumentException, "Unable to parse the format string \"" +
@@ -157,9 +164,9 @@ Token KRPredicateLexer::nextToken() {
   if (position_ >= format_.size()) return Token{Token::Kind::End, "", {}, position_};
   const char c = format_[position_];
   if (isDigit(c)) return lexNumber();
-  if (c == '\'' || c == '"') return lexString();
+  if (isQuote(c)) return lexString();
   if (c == '%') return lexArgument();
-  if (c == '#') return lexPrefixedName(Token::Kind::Identifier);
+  if (c == '#') return lexEscapedKey();
   if (c == '$') return lexPrefixedName(Token::Kind::Variable);
   if (c == '@' || isWordStart(c)) return lexWord();
   return lexSymbol();
@@ -186,6 +193,17 @@ Token KRPredicateLexer::lexWord() {
   std::string word = readName(start);
   if (isReservedWord(word)) return Token{Token::Kind::Keyword, upperCased(word), {}, start};
   return Token{Token::Kind::Identifier, std::move(word), {}, start};
+}
+
+Token KRPredicateLexer::lexEscapedKey() {
+  if (position_ + 1 >= format_.size() || !isQuote(format_[position_ + 1])) {
+    return lexPrefixedName(Token::Kind::Identifier);
+  }
+  const size_t start = position_++;
+  Token key = lexString();
+  key.kind = Token::Kind::Identifier;
+  key.position = start;
+  return key;
 }
 
 Token KRPredicateLexer::lexPrefixedName(Token::Kind kind) {

@@ -10,7 +10,9 @@
 // Splits a predicate or expression format string into tokens. Shared by predicates and expressions.
 //
 // - Words are keys, or keywords when they spell a reserved word in any case (AND, in, Self...);
-//   "#word" is always a key. Keywords come out in upper case.
+//   "#word" is always a key. Keywords come out in upper case. "#" before a quoted string makes a key of
+//   any text, read with the escapes of strings ("#'first name'", "#'2x'", "#''"), for key names that
+//   are not words.
 // - Numbers are decimal: integers (signed, then unsigned 64-bit, then double when too large) and
 //   decimals with optional exponents. A minus sign is never part of a number: it is a symbol.
 // - Strings are single- or double-quoted, with the escapes \n \t \r \\ \" \' and \uXXXX (surrogate
@@ -33,6 +35,9 @@ class KRPredicateLexer {
   static std::vector<Token> tokenize(const std::string& format);
   // Whether a word (in any case) is reserved by the format syntax, so that a key spelled so needs "#".
   static bool isReservedWord(std::string_view word);
+  // Whether a key name reads back as one key by itself: a word, optionally after "@" (as in "@count").
+  // Reserved words are such names too, but need "#" in front.
+  static bool isPlainName(std::string_view name);
   // Raises NSInvalidArgumentException: the format could not be parsed at a byte position.
   [[noreturn]] static void raiseParseError(const std::string& format, size_t position,
                                            const std::string& detail);
@@ -45,6 +50,8 @@ class KRPredicateLexer {
   Token nextToken();
   // A key or a keyword.
   Token lexWord();
+  // "#key" or "#'quoted key'", never a keyword.
+  Token lexEscapedKey();
   // "#key" (never a keyword) or "$variable".
   Token lexPrefixedName(Token::Kind kind);
   // Reads a name (optionally "@" first, as in "@count"); failures point at `tokenStart`.

@@ -195,6 +195,26 @@ TEST_F(KRExpressionTest, FormatsUseMinimalParentheses) {
   }
 }
 
+TEST_F(KRExpressionTest, KeysThatAreNotPlainNamesAreEscaped) {
+  const std::vector<std::pair<std::string, std::string>> cases = {
+      {"first name", "#\"first name\""},
+      {"a.1st.b", "a.#\"1st\".b"},
+      {"$x", "#\"$x\""},
+      {"in.Self", "#in.#Self"},
+      {"say \"hi\"", "#\"say \\\"hi\\\"\""},
+      {"größe.@count", "größe.@count"},
+      {"", "#\"\""},
+      {"a..b", "a.#\"\".b"},
+      {"SELF.SELF.x", "SELF.#SELF.x"},
+  };
+  for (const auto& [keyPath, expected] : cases) {
+    SCOPED_TRACE(keyPath);
+    const auto expression = KRExpression::expressionForKeyPath(keyPath);
+    EXPECT_EQ(expression->expressionFormat(), expected);
+    EXPECT_TRUE(KRExpression::expressionWithFormat(expected)->isEqual(expression));
+  }
+}
+
 TEST_F(KRExpressionTest, ConstantsWithoutLiteralsFormatAsParseableText) {
   EXPECT_EQ(
       KRExpression::expressionForConstantValue(std::numeric_limits<double>::infinity())->expressionFormat(),

@@ -73,6 +73,30 @@ TEST(KRPredicateLexerTest, HashEscapesKeywordsAndDollarNamesVariables) {
   EXPECT_EQ(texts(tokens), (std::vector<std::string>{"and", "limit", "@count", "@sum", ""}));
 }
 
+TEST(KRPredicateLexerTest, HashBeforeAQuotedStringMakesAKeyOfAnyText) {
+  const std::vector<Token> tokens =
+      KRPredicateLexer::tokenize("#'first name' #\"and\" #'' #'a\\'b\\u00e9' #'1x'.y");
+  EXPECT_EQ(kinds(tokens),
+            (std::vector<Kind>{Kind::Identifier, Kind::Identifier, Kind::Identifier, Kind::Identifier,
+                               Kind::Identifier, Kind::Symbol, Kind::Identifier, Kind::End}));
+  EXPECT_EQ(texts(tokens), (std::vector<std::string>{"first name", "and", "", "a'bé", "1x", ".", "y", ""}));
+  EXPECT_EQ(tokens[1].position, 14u);
+}
+
+TEST(KRPredicateLexerTest, BadQuotedKeysFail) {
+  EXPECT_THROW(KRPredicateLexer::tokenize("#'open == 1"), KRException);
+  EXPECT_THROW(KRPredicateLexer::tokenize("#'bad \\q'"), KRException);
+}
+
+TEST(KRPredicateLexerTest, PlainNames) {
+  for (const char* name : {"rating", "_x", "größe", "a1", "@count", "AND"}) {
+    EXPECT_TRUE(KRPredicateLexer::isPlainName(name)) << name;
+  }
+  for (const char* name : {"", "1a", "first name", "a-b", "$x", "#x", "@", "@1", "a.b", "x'"}) {
+    EXPECT_FALSE(KRPredicateLexer::isPlainName(name)) << name;
+  }
+}
+
 TEST(KRPredicateLexerTest, NonAsciiLettersBelongToNames) {
   const std::vector<Token> tokens = KRPredicateLexer::tokenize("größe == 1");
   EXPECT_EQ(tokens.front().kind, Kind::Identifier);

@@ -7,6 +7,7 @@
 #include <thread>
 #include <vector>
 
+#include "KRFoundation/KRComparisonPredicate.hpp"
 #include "KRFoundation/KRException.hpp"
 #include "KRFoundation/KRExpression.hpp"
 
@@ -162,6 +163,36 @@ TEST(KRPredicateTest, StringOperatorsNeedStrings) {
       {"missing BEGINSWITH ''", kNumbers, false},
       {"'abc' ENDSWITH nil", kNumbers, false},
   });
+}
+
+// Membership tests evaluate predicates in parallel, so ordering unordered values answers false instead
+// of raising.
+TEST(KRPredicateTest, OrderingAStringAgainstANumberIsFalse) {
+  const KRDictionary object{{"s", "abc"}, {"n", 5}};
+  for (const char* format : {"'abc' < 5", "'abc' >= 5", "5 > 'abc'", "s <= n", "s > n", "ANY {s} < 5",
+                             "s BETWEEN {1, 9}", "n BETWEEN {'a', 'z'}"}) {
+    SCOPED_TRACE(format);
+    bool holds = true;
+    EXPECT_NO_THROW(holds = KRPredicate::predicateWithFormat(format)->evaluateWithObject(object));
+    EXPECT_FALSE(holds);
+  }
+  EXPECT_TRUE(KRPredicate::predicateWithFormat("NOT 'abc' < 5")->evaluateWithObject(object));
+}
+
+// The pattern matches the whole text; "." stops at line breaks and ^ $ anchor at its ends only.
+TEST(KRPredicateTest, MatchesTreatsLineBreaksAsPlainCharacters) {
+  const KRDictionary object{{"s", "a\nb"}};
+  const std::vector<std::pair<std::string, bool>> cases = {
+      {"a.b", false},  {"^a$.*", false},     {"a", false},      {"b", false},      {".*", false},
+      {"a\\nb", true}, {"a[\\s\\S]b", true}, {"^a\\nb$", true}, {"(?s)a.b", true},
+  };
+  for (const auto& [pattern, expected] : cases) {
+    SCOPED_TRACE(pattern);
+    EXPECT_EQ(KRPredicate::predicateWithFormat("s MATCHES %@", {pattern})->evaluateWithObject(object),
+              expected);
+  }
+  EXPECT_FALSE(KRPredicate::predicateWithFormat("'a\\nb' MATCHES 'a.b'")->evaluateWithObject(KRValue()));
+  EXPECT_TRUE(KRPredicate::predicateWithFormat("'a\\nb' MATCHES 'a\\\\nb'")->evaluateWithObject(KRValue()));
 }
 
 TEST(KRPredicateTest, DatesCompareByTime) {
@@ -464,6 +495,59 @@ TEST(KRPredicateTest, FormatsParseBackToEqualPredicates) {
     EXPECT_EQ(reparsed->predicateFormat(), parsed->predicateFormat());
     EXPECT_EQ(parsed->description(), parsed->predicateFormat());
   }
+}
+
+TEST(KRPredicateTest, EveryKeyGivenThroughKParsesBack) {
+  // Every reserved word of the format, and words other formats reserve that are plain keys here.
+  std::vector<std::string> keys = {
+      "AND",      "OR",         "NOT",      "IN",       "BETWEEN", "LIKE",          "MATCHES",
+      "CONTAINS", "BEGINSWITH", "ENDSWITH", "ANY",      "ALL",     "NONE",          "SOME",
+      "YES",      "NO",         "TRUE",     "FALSE",    "NIL",     "NULL",          "SELF",
+      "FUNCTION", "CAST",       "and",      "In",       "self",    "TruePredicate", "falsepredicate",
+      "FIRST",    "LAST",       "SIZE",     "SUBQUERY", "ANYKEY",  "UNIQUE",        "TRUEPREDICATE",
+  };
+  // Keys that are not plain names, and key paths whose components are not.
+  const std::vector<std::string> oddKeys = {
+      "first name",  " lead", "trail ", "a-b",       "a+b",       "a,b",
+      "(x)",         "x==1",  "x[c]",   "'q'",       "\"dq\"",    "back\\slash",
+      "line\nbreak", "tab\t", "\x01",   "1abc",      "2",         "_x",
+      "été",         "日本",  "😀",      "$x",        "$",         "#",
+      "#x",          "%K",    "%@",     "@count",    "@",         "@1",
+      "a.@count",    "a..b",  ".a",     "a.",        ".",         "a.first name.b",
+      "a.1.b",       "a.AND", "IN.x",   "SELF.name", "SELF.SELF", "SELF.SELF.x",
+      "a.SELF",      "SELF.", ".SELF",
+  };
+  keys.insert(keys.end(), oddKeys.begin(), oddKeys.end());
+  for (const std::string& key : keys) {
+    SCOPED_TRACE(key);
+    const auto parsed = KRPredicate::predicateWithFormat("%K == 1 AND ANY %K IN {%K}", {key, key, key});
+    const auto reparsed = KRPredicate::predicateWithFormat(parsed->predicateFormat());
+    EXPECT_TRUE(parsed->isEqual(reparsed)) << parsed->predicateFormat();
+    EXPECT_EQ(reparsed->predicateFormat(), parsed->predicateFormat());
+  }
+}
+
+TEST(KRPredicateTest, KeysAreEscapedInFormats) {
+  const auto format = [](const std::string& key) {
+    return KRPredicate::predicateWithFormat("%K == 1", {key})->predicateFormat();
+  };
+  EXPECT_EQ(format("IN"), "#IN == 1");
+  EXPECT_EQ(format("a.in"), "a.#in == 1");
+  EXPECT_EQ(format("first name"), "#\"first name\" == 1");
+  EXPECT_EQ(format("$x"), "#\"$x\" == 1");
+  EXPECT_EQ(format("rating"), "rating == 1");
+  EXPECT_TRUE(KRPredicate::predicateWithFormat("#\"first name\" == 1")
+                  ->evaluateWithObject(KRDictionary{{"first name", 1}}));
+}
+
+// %K refuses an empty key path; one made directly is written as the quoted empty key and reads back.
+TEST(KRPredicateTest, EmptyKeyPathsParseBack) {
+  const auto empty = KRComparisonPredicate::predicateWithLeftExpression(
+      KRExpression::expressionForKeyPath(""), KRExpression::expressionForConstantValue(1),
+      KRComparisonPredicate::Modifier::Direct, KRComparisonPredicate::Type::EqualTo);
+  EXPECT_EQ(empty->predicateFormat(), "#\"\" == 1");
+  EXPECT_TRUE(KRPredicate::predicateWithFormat(empty->predicateFormat())->isEqual(empty));
+  EXPECT_THROW(KRPredicate::predicateWithFormat("%K == 1", {""}), KRException);
 }
 
 TEST(KRPredicateTest, FormatsWithArgumentsParseBackToEqualPredicates) {

@@ -16,7 +16,9 @@
 //   different types are unequal; other values of one type (arrays, sets, dictionaries, objects) use
 //   their own equality.
 // - Order (< <= > >= BETWEEN) exists between two numbers, two strings or two dates only; anything else
-//   (nil included) is unordered and every ordering test is false.
+//   (nil included, and a string against a number: "abc" < 5) is unordered and every ordering test is
+//   false. Unlike the platform, which raises there, it never throws: membership tests evaluate
+//   predicates in parallel and must not throw.
 // - BEGINSWITH, ENDSWITH, LIKE and MATCHES need two strings, otherwise they are false.
 // - IN: the left value is an element of the right array or set (by the equality above), or a
 //   substring of the right string. CONTAINS is IN with the sides swapped.

@@ -17,6 +17,7 @@ KRRegularExpression::KRRegularExpression(const std::string& pattern, bool caseIn
     : pattern_(pattern), folding_(false, diacriticInsensitive) {
   UParseError where{};
   UErrorCode status = U_ZERO_ERROR;
+  // Neither UREGEX_DOTALL nor UREGEX_MULTILINE: line breaks stay ordinary characters.
   const uint32_t flags = caseInsensitive ? UREGEX_CASE_INSENSITIVE : 0;
   compiled_.reset(
       icu::RegexPattern::compile(icu::UnicodeString::fromUTF8(folding_.fold(pattern)), flags, where, status));

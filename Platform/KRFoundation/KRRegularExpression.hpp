@@ -13,6 +13,9 @@ U_NAMESPACE_END
 
 // An ICU regular expression for MATCHES: compiled once, then matched against whole texts.
 //
+// Line breaks are ordinary characters: "." does not match a line terminator, and ^ and $ anchor at the
+// start and end of the whole text only, so "a\nb" matches neither "a.b" nor "^a$.*" (the inline flags
+// (?s) and (?m) turn these on for one pattern).
 // The compiled pattern is immutable and shared; every match makes its own matcher, so one expression
 // may be matched from several threads at once. Diacritic-insensitive expressions strip the diacritics
 // of the pattern and of every text (KRStringComparator folding); case-insensitive ones use ICU's

@@ -42,6 +42,9 @@ TEST(KRComparisonOperatorTest, OrderExistsOnlyWithinNumbersStringsAndDates) {
                     KRDate::dateWithTimeIntervalSince1970(1)));
   EXPECT_FALSE(holds(Type::LessThan, 1, "2"));
   EXPECT_FALSE(holds(Type::GreaterThan, "2", 1));
+  EXPECT_FALSE(holds(Type::LessThan, "abc", 5));
+  EXPECT_FALSE(holds(Type::GreaterThanOrEqualTo, "abc", 5));
+  EXPECT_FALSE(holds(Type::Between, "abc", KRArray{1, 9}));
   EXPECT_FALSE(holds(Type::LessThan, KRArray{1}, KRArray{2}));
   EXPECT_FALSE(holds(Type::LessThan, KRDate::dateWithTimeIntervalSince1970(1), 2));
 }

@@ -23,6 +23,19 @@ TEST(KRRegularExpressionTest, CaseAndDiacriticOptions) {
   EXPECT_TRUE(KRRegularExpression("ete", true, true).matches("ÉTÉ"));
 }
 
+TEST(KRRegularExpressionTest, LineBreaksAreOrdinaryCharacters) {
+  for (const bool folded : {false, true}) {
+    SCOPED_TRACE(folded);
+    EXPECT_FALSE(KRRegularExpression("a.b", folded, folded).matches("a\nb"));
+    EXPECT_FALSE(KRRegularExpression("^a$.*", folded, folded).matches("a\nb"));
+    EXPECT_FALSE(KRRegularExpression("a..b", folded, folded).matches("a\r\nb"));
+    EXPECT_FALSE(KRRegularExpression("a.b", folded, folded).matches("a\u2028b"));
+    EXPECT_TRUE(KRRegularExpression("a\\nb", folded, folded).matches("a\nb"));
+    EXPECT_TRUE(KRRegularExpression("a[\\s\\S]b", folded, folded).matches("a\nb"));
+    EXPECT_TRUE(KRRegularExpression("^a\\nb$", folded, folded).matches("a\nb"));
+  }
+}
+
 TEST(KRRegularExpressionTest, UnicodeAwareClasses) {
   EXPECT_TRUE(KRRegularExpression("\\w+", false, false).matches("größe"));
   EXPECT_TRUE(KRRegularExpression(".", false, false).matches("\xF0\x9F\x98\x80"));

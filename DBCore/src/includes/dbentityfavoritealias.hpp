@@ -24,4 +24,6 @@ class DBEntityFavoriteAlias : public DBRecord<DBEntityFavoriteAlias, kDBEntityFa
   int64_t orig_id = 0;
 };
 
+extern template class DBRecord<DBEntityFavoriteAlias, kDBEntityFavoriteAliasType>;
+
 }  // namespace dbcore

@@ -45,4 +45,6 @@ class DBExivImgAttrib : public DBRecord<DBExivImgAttrib, kDBExivImgAttribType> {
   int32_t version = 0;
 };
 
+extern template class DBRecord<DBExivImgAttrib, kDBExivImgAttribType>;
+
 }  // namespace dbcore

@@ -19,4 +19,6 @@ class DBFilter : public DBRecord<DBFilter, kDBFilterType> {
   float order = 0.0f;
 };
 
+extern template class DBRecord<DBFilter, kDBFilterType>;
+
 }  // namespace dbcore

@@ -21,4 +21,6 @@ class DBFilterAttrib : public DBRecord<DBFilterAttrib, kDBFilterAttribType> {
   std::wstring selected_filter_types;
 };
 
+extern template class DBRecord<DBFilterAttrib, kDBFilterAttribType>;
+
 }  // namespace dbcore

@@ -24,4 +24,6 @@ class DBImage : public DBRecord<DBImage, kDBImageType> {
   int64_t creation_date = 0;
 };
 
+extern template class DBRecord<DBImage, kDBImageType>;
+
 }  // namespace dbcore

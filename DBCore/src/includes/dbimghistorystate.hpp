@@ -25,4 +25,6 @@ class DBImgHistoryState : public DBRecord<DBImgHistoryState, kDBImgHistoryStateT
   bool original = false;
 };
 
+extern template class DBRecord<DBImgHistoryState, kDBImgHistoryStateType>;
+
 }  // namespace dbcore

@@ -51,7 +51,7 @@ class DBImgSelectQuery : public DBEntitySelectQuery {
  protected:
   std::vector<std::shared_ptr<token_node>> conditionTrees() const override;
   uint32_t joinedSlots() const override;
-  std::vector<DBSelectPlan::Restriction> restrictions() const override;
+  std::vector<DBSelectRestriction> restrictions() const override;
 
  private:
   // The folder tree of PathPrefix: a volume and a path without trailing separators.
@@ -61,8 +61,8 @@ class DBImgSelectQuery : public DBEntitySelectQuery {
   };
 
   void join(const std::string& table, std::shared_ptr<DBClause> clause);
-  DBSelectPlan::Restriction filtersRestriction() const;
-  DBSelectPlan::Restriction folderTreeRestriction() const;
+  DBSelectRestriction filtersRestriction() const;
+  DBSelectRestriction folderTreeRestriction() const;
 
   std::vector<long long> filterIds_;
   std::optional<FolderTree> folderTree_;

@@ -20,4 +20,6 @@ class DBPath : public DBRecord<DBPath, kDBPathType> {
   std::wstring path;
 };
 
+extern template class DBRecord<DBPath, kDBPathType>;
+
 }  // namespace dbcore

@@ -21,4 +21,6 @@ class DBRefFolder : public DBRecord<DBRefFolder, kDBRefFolderType> {
   float order = 0.0f;
 };
 
+extern template class DBRecord<DBRefFolder, kDBRefFolderType>;
+
 }  // namespace dbcore

@@ -21,4 +21,6 @@ class DBRefFolderAttrib : public DBRecord<DBRefFolderAttrib, kDBRefFolderAttribT
   std::wstring selected_filter_types;
 };
 
+extern template class DBRecord<DBRefFolderAttrib, kDBRefFolderAttribType>;
+
 }  // namespace dbcore

@@ -16,4 +16,6 @@ class DBResource : public DBRecord<DBResource, kDBResourceType> {
   std::wstring name;
 };
 
+extern template class DBRecord<DBResource, kDBResourceType>;
+
 }  // namespace dbcore

@@ -2,18 +2,33 @@
 
 #include <atomic>
 #include <cstdint>
+#include <functional>
 #include <memory>
-#include <mutex>
 #include <string>
 #include <vector>
 
 #include "dbclause.hpp"
 #include "dbentity.hpp"
-#include "dbselectplan.hpp"
-#include "dbsqlrow.hpp"
-#include "dbvalidationrecord.hpp"
+#include "tvariant.hpp"
 
 namespace dbcore {
+
+class DBSelectPlan;
+class DBSqlRow;
+class DBValidationRecord;
+
+// Gives the record of a related table that belongs to a record (for an image: its user attributes in
+// "image_user_attributes", its exif attributes in "image_exiv_attributes"), or an empty pointer when it
+// has none. Called from any thread: it must be thread-safe and must not call the engine.
+using DBRelatedRecordResolver =
+    std::function<std::shared_ptr<DBEntity>(const DBEntity& record, const std::string& relatedTable)>;
+
+// A condition of a query beyond its clauses (an SQL expression of the engine's own) and the values of its
+// parameters, in order.
+struct DBSelectRestriction {
+  std::string sql;
+  std::vector<TVariant> parameters;
+};
 
 // The column of Result's map that tells whether the record satisfies the query (a T_BOOL value).
 inline constexpr const char* kSelectResultColumn = "result_bool";
@@ -68,7 +83,7 @@ class DBEntitySelectQuery {
   std::shared_ptr<const DBSelectPlan> planFor(const std::string& table) const;
 
   // For the engine: keeps the values of the plan's max/min sub-selects, read when the query ran, for
-  // Result. Ignored unless the plan is the query's current one.
+  // Result, in place of those kept before. Ignored unless the plan is the query's current one.
   void keepAggregates(const std::shared_ptr<const DBSelectPlan>& plan, DBSqlRow values);
 
  protected:
@@ -81,27 +96,22 @@ class DBEntitySelectQuery {
   virtual std::vector<std::shared_ptr<token_node>> conditionTrees() const;
   // Related tables joined whatever the conditions read (bit n: related table n).
   virtual uint32_t joinedSlots() const { return 0; }
-  virtual std::vector<DBSelectPlan::Restriction> restrictions() const { return {}; }
+  virtual std::vector<DBSelectRestriction> restrictions() const;
 
  private:
-  // Sub-select values with the plan they were read for. Kept until the query goes, so that a reader
-  // never sees one freed; a run that reads the values already kept adds none, so a query grows only by
-  // the distinct values its sub-selects take.
-  struct AggregateSnapshot {
-    std::shared_ptr<const DBSelectPlan> plan;
-    DBSqlRow values;
-  };
+  // Sub-select values with the plan they were read for.
+  struct AggregateSnapshot;
 
   std::shared_ptr<const DBSelectPlan> makePlan(const std::string& table) const;
+  bool evaluate(const DBValidationRecord& record) const;
 
   std::string table_;
   std::shared_ptr<DBClause> where_;
   DBRelatedRecordResolver resolver_;
   std::shared_ptr<const DBSelectPlan> plan_;
-  std::mutex snapshotsMutex_;
-  std::vector<std::unique_ptr<const AggregateSnapshot>> snapshots_;
-  // The snapshot Result reads; read without the lock.
-  std::atomic<const AggregateSnapshot*> aggregates_{nullptr};
+  // The snapshot Result reads. A reader holds the one it loaded while it evaluates, so a new snapshot
+  // may replace it at any time and the query keeps only the current one.
+  std::atomic<std::shared_ptr<const AggregateSnapshot>> aggregates_;
 };
 
 }  // namespace dbcore

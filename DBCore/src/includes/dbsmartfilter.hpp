@@ -20,4 +20,6 @@ class DBSmartFilter : public DBRecord<DBSmartFilter, kDBSmartFilterType> {
   std::wstring name;
 };
 
+extern template class DBRecord<DBSmartFilter, kDBSmartFilterType>;
+
 }  // namespace dbcore

@@ -20,4 +20,6 @@ class DBSmartFilterAttrib : public DBRecord<DBSmartFilterAttrib, kDBSmartFilterA
   std::wstring selected_filter_types;
 };
 
+extern template class DBRecord<DBSmartFilterAttrib, kDBSmartFilterAttribType>;
+
 }  // namespace dbcore

@@ -28,4 +28,6 @@ class DBUserImgAttrib : public DBRecord<DBUserImgAttrib, kDBUserImgAttribType> {
   int32_t tutorial = 0;
 };
 
+extern template class DBRecord<DBUserImgAttrib, kDBUserImgAttribType>;
+
 }  // namespace dbcore

@@ -18,4 +18,6 @@ class DBVolume : public DBRecord<DBVolume, kDBVolumeType> {
   std::wstring info;
 };
 
+extern template class DBRecord<DBVolume, kDBVolumeType>;
+
 }  // namespace dbcore

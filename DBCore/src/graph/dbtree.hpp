@@ -20,10 +20,11 @@ class DBTree {
 
   template <class T>
   static std::vector<std::shared_ptr<T>> children(DBConnection& connection, long long parentId) {
-    DBStatement& statement =
-        connection.prepare(DBRecordIO::selectSql<T>() + " WHERE parent_id = ? ORDER BY " + orderClause<T>());
-    statement.bind(1, static_cast<int64_t>(parentId));
-    return DBRecordIO::readAll<T>(statement);
+    static const DBStaticSql kSql(DBRecordIO::selectSql<T>() + " WHERE parent_id = ? ORDER BY " +
+                                  orderClause<T>());
+    const DBStatementLease statement = connection.prepare(kSql);
+    statement->bind(1, static_cast<int64_t>(parentId));
+    return DBRecordIO::readAll<T>(*statement);
   }
 
   // Every record below the parent, depth first, siblings in tree order; a record met twice (a cycle in a
@@ -48,24 +49,24 @@ class DBTree {
   // The parent's id, or 0 for a top-level or missing record.
   template <class T>
   static long long parentId(DBConnection& connection, long long id) {
-    DBStatement& statement =
-        connection.prepare(std::string("SELECT parent_id FROM ") + T::kTableName + " WHERE _id_int_64 = ?");
-    statement.bind(1, static_cast<int64_t>(id));
-    const long long parent = statement.step() ? statement.columnInt64(0) : 0;
-    statement.reset();
-    return parent;
+    static const DBStaticSql kSql(std::string("SELECT parent_id FROM ") + T::kTableName +
+                                  " WHERE _id_int_64 = ?");
+    const DBStatementLease statement = connection.prepare(kSql);
+    statement->bind(1, static_cast<int64_t>(id));
+    return statement->step() ? statement->columnInt64(0) : 0;
   }
 
   template <class T>
   static void setParent(DBConnection& connection, long long id, long long parentId) {
-    DBStatement& statement = connection.prepare(std::string("UPDATE ") + T::kTableName +
-                                                " SET parent_id = ? WHERE _id_int_64 = ?");
+    static const DBStaticSql kSql(std::string("UPDATE ") + T::kTableName +
+                                  " SET parent_id = ? WHERE _id_int_64 = ?");
+    const DBStatementLease statement = connection.prepare(kSql);
     if (parentId > 0) {
-      statement.bind(1, static_cast<int64_t>(parentId));
+      statement->bind(1, static_cast<int64_t>(parentId));
     } else {
-      statement.bindNull(1);
+      statement->bindNull(1);
     }
-    statement.bind(2, static_cast<int64_t>(id)).execute();
+    statement->bind(2, static_cast<int64_t>(id)).execute();
   }
 
   // True when `ancestor` is `id` itself or above it. A damaged file may hold a cycle: the walk stops

@@ -35,16 +35,17 @@ void DBSelectQueryRunner::keepAggregates(DBConnection& connection, DBEntitySelec
                                          const std::shared_ptr<const DBSelectPlan>& plan) {
   const DBClauseProgram& program = plan->program();
   if (program.aggregateSql().empty()) return;
-  DBStatement& statement = connection.prepare(program.aggregateSql());
   const std::vector<FieldType>& types = program.aggregateTypes();
   std::vector<std::string> texts(types.size());
   std::vector<DBSqlValue> values;
-  if (statement.step()) {
-    for (std::size_t index = 0; index < types.size(); ++index) {
-      values.push_back(aggregateValue(statement, static_cast<int>(index), types[index], texts[index]));
+  {
+    const DBStatementLease statement = connection.prepare(program.aggregateSql());
+    if (statement->step()) {
+      for (std::size_t index = 0; index < types.size(); ++index) {
+        values.push_back(aggregateValue(*statement, static_cast<int>(index), types[index], texts[index]));
+      }
     }
   }
-  statement.reset();
   query.keepAggregates(plan, DBSqlRow(values));
 }
 

@@ -24,9 +24,9 @@ class DBSelectQueryRunner {
     const std::shared_ptr<const DBSelectPlan> plan = planOf(query, T::kTableName);
     if (plan->selectsNothing()) return {};
     keepAggregates(connection, *query, plan);
-    DBStatement& statement = connection.prepare(DBRecordIO::selectSql<T>() + plan->tail());
-    bind(statement, plan->parameters());
-    return DBRecordIO::readAll<T>(statement);
+    const DBStatementLease statement = connection.prepare(DBRecordIO::selectSql<T>() + plan->tail());
+    bind(*statement, plan->parameters());
+    return DBRecordIO::readAll<T>(*statement);
   }
 
  private:

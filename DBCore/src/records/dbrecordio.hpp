@@ -36,28 +36,32 @@ class DBRecordIO {
     return record;
   }
 
-  // Every remaining row of a statement made from selectSql(); resets the statement.
+  // Every remaining row of a statement made from selectSql().
   template <class T>
   static std::vector<std::shared_ptr<T>> readAll(DBStatement& statement) {
     std::vector<std::shared_ptr<T>> records;
     while (statement.step()) records.push_back(read<T>(statement));
-    statement.reset();
     return records;
   }
 
-  // The first row only, or an empty pointer; resets the statement.
+  // The first row only, or an empty pointer.
   template <class T>
   static std::shared_ptr<T> readOne(DBStatement& statement) {
-    std::shared_ptr<T> record = statement.step() ? read<T>(statement) : nullptr;
-    statement.reset();
-    return record;
+    return statement.step() ? read<T>(statement) : nullptr;
   }
 
   template <class T>
   static std::shared_ptr<T> get(DBConnection& connection, int64_t id) {
-    DBStatement& statement = connection.prepare(selectSql<T>() + " WHERE _id_int_64 = ?");
-    statement.bind(1, id);
-    return readOne<T>(statement);
+    static const DBStaticSql kSql(selectSql<T>() + " WHERE _id_int_64 = ?");
+    return getWhere<T>(connection, kSql, id);
+  }
+
+  // The first record that a select of T (selectSql() with a condition of one parameter) gives for the value.
+  template <class T>
+  static std::shared_ptr<T> getWhere(DBConnection& connection, const DBStaticSql& sql, int64_t value) {
+    const DBStatementLease statement = connection.prepare(sql);
+    statement->bind(1, value);
+    return readOne<T>(*statement);
   }
 
   // Inserts an unsaved record (assigning its id) or replaces the stored values of a saved one (inserting
@@ -66,20 +70,18 @@ class DBRecordIO {
   template <class T>
   static void write(DBConnection& connection, T& record) {
     if (record.is_saved()) {
-      writeColumns(connection.prepare(updateSql<T>()), record);
+      writeColumns(*connection.prepare(updateSql<T>()), record);
       if (connection.changes() > 0) return;
     }
-    DBStatement& statement = connection.prepare(insertSql<T>());
-    writeColumns(statement, record);
+    writeColumns(*connection.prepare(insertSql<T>()), record);
     if (!record.is_saved()) record.set_id(connection.lastInsertRowId());
   }
 
   // Deletes the record's row; true when there was one.
   template <class T>
   static bool remove(DBConnection& connection, const T& record) {
-    connection.prepare(std::string("DELETE FROM ") + T::kTableName + " WHERE _id_int_64 = ?")
-        .bind(1, record.id())
-        .execute();
+    static const DBStaticSql kSql(std::string("DELETE FROM ") + T::kTableName + " WHERE _id_int_64 = ?");
+    connection.prepare(kSql)->bind(1, record.id()).execute();
     return connection.changes() > 0;
   }
 
@@ -94,8 +96,8 @@ class DBRecordIO {
   }
 
   template <class T>
-  static const std::string& insertSql() {
-    static const std::string sql = [] {
+  static const DBStaticSql& insertSql() {
+    static const DBStaticSql sql([] {
       std::string names;
       std::string values;
       for (const auto& column : T::all_columns()) {
@@ -105,14 +107,14 @@ class DBRecordIO {
       names.pop_back();
       values.pop_back();
       return std::string("INSERT INTO ") + T::kTableName + "(" + names + ") VALUES(" + values + ")";
-    }();
+    }());
     return sql;
   }
 
   // Parameters numbered as in insertSql(): the id is ?1.
   template <class T>
-  static const std::string& updateSql() {
-    static const std::string sql = [] {
+  static const DBStaticSql& updateSql() {
+    static const DBStaticSql sql([] {
       std::string assignments;
       int index = 0;
       for (const auto& column : T::all_columns()) {
@@ -121,7 +123,7 @@ class DBRecordIO {
       }
       assignments.pop_back();
       return std::string("UPDATE ") + T::kTableName + " SET " + assignments + " WHERE " + kIdColumn + "=?1";
-    }();
+    }());
     return sql;
   }
 };

@@ -14,13 +14,18 @@ namespace {
   throw DBException(message, extended);
 }
 
+sqlite3* openDatabase(const std::string& path) {
+  sqlite3* db = nullptr;
+  const int flags = SQLITE_OPEN_READWRITE | SQLITE_OPEN_CREATE | SQLITE_OPEN_NOMUTEX;
+  const int code = sqlite3_open_v2(path.c_str(), &db, flags, nullptr);
+  if (code != SQLITE_OK) failOpen(db, code);
+  sqlite3_extended_result_codes(db, 1);
+  return db;
+}
+
 }  // namespace
 
-DBConnection::DBConnection(const std::string& path) {
-  const int flags = SQLITE_OPEN_READWRITE | SQLITE_OPEN_CREATE | SQLITE_OPEN_NOMUTEX;
-  const int code = sqlite3_open_v2(path.c_str(), &db_, flags, nullptr);
-  if (code != SQLITE_OK) failOpen(db_, code);
-  sqlite3_extended_result_codes(db_, 1);
+DBConnection::DBConnection(const std::string& path) : db_(openDatabase(path)), statements_(db_) {
   try {
     configure();
   } catch (...) {
@@ -47,7 +52,8 @@ void DBConnection::configure() {
   // instead of going through a temporary file page by page.
   exec("PRAGMA temp_store = MEMORY");
   // Reading the schema here makes a file that is not a database fail now rather than later.
-  queryInt64("SELECT count(*) FROM sqlite_schema");
+  static const DBStaticSql kCountSchema("SELECT count(*) FROM sqlite_schema");
+  queryInt64(kCountSchema);
 }
 
 void DBConnection::exec(const std::string& sql) {
@@ -59,24 +65,12 @@ void DBConnection::exec(const std::string& sql) {
   throw DBException(message, sqlite3_extended_errcode(db_));
 }
 
-DBStatement& DBConnection::prepare(const std::string& sql) {
-  auto& slot = statements_[sql];
-  if (!slot) {
-    try {
-      slot = std::make_unique<DBStatement>(db_, sql);
-    } catch (...) {
-      statements_.erase(sql);
-      throw;
-    }
-  }
-  return slot->reset();
+DBStatementLease DBConnection::prepare(const DBStaticSql& sql) {
+  return DBStatementLease(statements_.statement(sql));
 }
 
-int64_t DBConnection::queryInt64(const std::string& sql) {
-  DBStatement& statement = prepare(sql);
-  const int64_t value = statement.step() ? statement.columnInt64(0) : 0;
-  statement.reset();
-  return value;
+DBStatementLease DBConnection::prepare(const std::string& sql) {
+  return DBStatementLease(statements_.statement(sql));
 }
 
 void DBConnection::transaction(const std::function<void()>& body) {

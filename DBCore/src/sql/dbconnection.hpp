@@ -3,11 +3,11 @@
 #include <sqlite3.h>
 
 #include <functional>
-#include <memory>
 #include <string>
-#include <unordered_map>
 
-#include "dbstatement.hpp"
+#include "dbstatementcache.hpp"
+#include "dbstatementlease.hpp"
+#include "dbstaticsql.hpp"
 
 namespace dbcore {
 
@@ -23,10 +23,18 @@ class DBConnection {
 
   // Runs SQL text of the engine's own (never built from outside input) with no results.
   void exec(const std::string& sql);
-  // The cached prepared statement for the SQL text, reset and ready to bind.
-  DBStatement& prepare(const std::string& sql);
-  // One integer from a query returning one row and column (0 when there is no row).
-  int64_t queryInt64(const std::string& sql);
+  // The cached prepared statement of the engine's own static SQL, lent ready to bind. Throws
+  // DBException when it is already lent.
+  DBStatementLease prepare(const DBStaticSql& sql);
+  // The same for generated SQL (select queries), from a cache of bounded size.
+  DBStatementLease prepare(const std::string& sql);
+  // One integer from a query returning one row and column (0 when there is no row); the SQL is static
+  // or generated, as for prepare().
+  template <class Sql>
+  int64_t queryInt64(const Sql& sql) {
+    const DBStatementLease statement = prepare(sql);
+    return statement->step() ? statement->columnInt64(0) : 0;
+  }
 
   // Runs the body atomically: in a transaction, or a savepoint when one is already open. An exception
   // leaving the body rolls back everything it wrote and passes on.
@@ -35,12 +43,13 @@ class DBConnection {
   int64_t lastInsertRowId() const { return sqlite3_last_insert_rowid(db_); }
   int changes() const { return sqlite3_changes(db_); }
   sqlite3* handle() const { return db_; }
+  const DBStatementCache& statements() const { return statements_; }
 
  private:
   void configure();
 
   sqlite3* db_ = nullptr;
-  std::unordered_map<std::string, std::unique_ptr<DBStatement>> statements_;
+  DBStatementCache statements_;
   int transactionDepth_ = 0;
 };
 

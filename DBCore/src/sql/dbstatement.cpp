@@ -20,6 +20,16 @@ DBStatement& DBStatement::reset() {
   return *this;
 }
 
+void DBStatement::lend() {
+  if (leased_) throw DBException(std::string("A statement is lent twice: ") + sqlite3_sql(statement_));
+  leased_ = true;
+}
+
+void DBStatement::giveBack() {
+  reset();
+  leased_ = false;
+}
+
 DBStatement& DBStatement::bind(int index, int64_t value) {
   const int code = sqlite3_bind_int64(statement_, index, value);
   if (code != SQLITE_OK) fail(code);

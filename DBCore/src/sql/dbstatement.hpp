@@ -19,6 +19,12 @@ class DBStatement {
 
   // Clears bindings and rewinds, ready for a new execution.
   DBStatement& reset();
+
+  // Marks the statement lent (DBStatementLease); throws DBException when it already is.
+  void lend();
+  // Ends a loan: resets the statement and marks it free.
+  void giveBack();
+  bool leased() const { return leased_; }
   DBStatement& bind(int index, int64_t value);
   DBStatement& bind(int index, const std::string& text);
   DBStatement& bind(int index, const TVariant& value);
@@ -45,6 +51,7 @@ class DBStatement {
   sqlite3* db_;
   sqlite3_stmt* statement_ = nullptr;
   std::string buffer_;
+  bool leased_ = false;
 };
 
 }  // namespace dbcore

@@ -392,3 +392,26 @@ TEST_F(DBReactorTest, BackupToAMissingFolderFails) {
   EXPECT_FALSE(reactor->Backup(s2ws(directory.file("missing/copy.krcatalog"))));
   EXPECT_FALSE(reactor->Backup(L""));
 }
+
+// The facade's templates serve only the record types they name; other types do not compile.
+template <class T>
+concept GettableRecord = requires(const DBReactor& reactor) {
+  reactor.Get<T>(1);
+};
+template <class T, class U>
+concept RelatedRecords = requires(const DBReactor& reactor, std::shared_ptr<U> record) {
+  reactor.GetBy<T, U>(record);
+};
+template <class T>
+concept QueriedRecord = requires(DBReactor& reactor, std::shared_ptr<DBEntitySelectQuery> query) {
+  reactor.GetBySelectQuery<T>(query);
+};
+
+TEST(DBReactorTemplatesTest, AcceptOnlyTheRecordTypesTheyServe) {
+  static_assert(GettableRecord<DBImage> && GettableRecord<DBExivImgAttrib>);
+  static_assert(!GettableRecord<DBVolume> && !GettableRecord<DBResource>);
+  static_assert(RelatedRecords<DBPath, DBImage> && RelatedRecords<DBVolume, DBPath>);
+  static_assert(!RelatedRecords<DBImage, DBVolume> && !RelatedRecords<DBVolume, DBImage>);
+  static_assert(QueriedRecord<DBVolume> && !QueriedRecord<DBFilter>);
+  SUCCEED();
+}

@@ -44,7 +44,7 @@ class DBTreeTest : public DBCatalogTestBase {
     const long long b = filter(1, a);
     const long long c = filter(1, b);
     connection->prepare("UPDATE filters SET parent_id = ? WHERE _id_int_64 = ?")
-        .bind(1, c)
+        ->bind(1, c)
         .bind(2, a)
         .execute();
     return {a, b, c};

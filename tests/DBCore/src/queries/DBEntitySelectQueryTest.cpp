@@ -11,6 +11,8 @@
 #include "dbimgselectquery.hpp"
 #include "dbpathselectquery.hpp"
 #include "dbselectplan.hpp"
+#include "dbsqlrow.hpp"
+#include "support/KRHeapUsage.hpp"
 
 using namespace dbcore;
 
@@ -112,6 +114,26 @@ TEST_F(DBEntitySelectQueryTest, SubSelectValuesComeFromTheLastRun) {
   // A new condition forgets the values read for the old one.
   query->Where(where<DBImage>("import_index == min_from_column(import_index)"));
   EXPECT_TRUE(satisfyingIds(query, std::vector<std::shared_ptr<DBImage>>{low, high, higher}).empty());
+}
+
+TEST_F(DBEntitySelectQueryTest, SubSelectValuesKeepOnlyTheLatestSnapshotOverManyRuns) {
+  const auto image = imageWithIndex(11000);
+  auto query = std::make_shared<DBImgSelectQuery>();
+  query->Where(where<DBImage>("import_index == max_from_column(import_index)"));
+  const auto plan = query->planFor(DBImage::kTableName);
+  // What the engine keeps after each run, the sub-select's value changing every time.
+  const auto runWithMaximum = [&](int32_t maximum) {
+    query->keepAggregates(plan, DBSqlRow(std::vector<TVariant>{TVariant(maximum)}));
+  };
+  for (int32_t run = 1; run <= 1000; ++run) runWithMaximum(run);
+  const std::size_t before = KRHeapUsage::allocatedBytes();
+  for (int32_t run = 1001; run <= 11000; ++run) runWithMaximum(run);
+  const std::size_t after = KRHeapUsage::allocatedBytes();
+  EXPECT_LT(after, before + 16 * 1024) << "grew by " << (after - before) << " bytes over 10,000 runs";
+  EXPECT_EQ(satisfyingIds(query, std::vector<std::shared_ptr<DBImage>>{image}),
+            std::vector<long long>{image->id()});
+  runWithMaximum(5);
+  EXPECT_TRUE(satisfyingIds(query, std::vector<std::shared_ptr<DBImage>>{image}).empty());
 }
 
 TEST_F(DBEntitySelectQueryTest, ResultRunsOnManyThreadsWhileTheQueryRuns) {

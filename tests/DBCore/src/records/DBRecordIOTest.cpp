@@ -24,7 +24,7 @@ class DBRecordIOTest : public DBCatalogTestBase {
 
   int64_t pathCount() { return connection->queryInt64("SELECT count(*) FROM paths"); }
 
-  DBStatement& pathsInIdOrder() {
+  DBStatementLease pathsInIdOrder() {
     return connection->prepare(DBRecordIO::selectSql<DBPath>() + " ORDER BY _id_int_64");
   }
 };
@@ -87,21 +87,19 @@ TEST_F(DBRecordIOTest, RemoveIsTrueOnlyForAStoredRow) {
   EXPECT_FALSE(DBRecordIO::remove(*connection, *record));
 }
 
-TEST_F(DBRecordIOTest, ReadOneResetsTheStatement) {
+TEST_F(DBRecordIOTest, ReadOneReadsTheFirstRowAndANewLeaseStartsAgain) {
   const auto first = saved(path(L"a"));
   saved(path(L"b"));
-  DBStatement& statement = pathsInIdOrder();
-  const auto once = DBRecordIO::readOne<DBPath>(statement);
-  // Without the reset the same statement would go on to the second row.
-  const auto twice = DBRecordIO::readOne<DBPath>(statement);
+  const auto once = DBRecordIO::readOne<DBPath>(*pathsInIdOrder());
+  // The first lease's end rewound the statement; otherwise it would go on to the second row.
+  const auto twice = DBRecordIO::readOne<DBPath>(*pathsInIdOrder());
   ASSERT_TRUE(once && twice);
   EXPECT_EQ(once->id(), first->id());
   EXPECT_EQ(twice->id(), first->id());
 }
 
-TEST_F(DBRecordIOTest, ReadAllResetsTheStatement) {
+TEST_F(DBRecordIOTest, ReadAllReadsEveryRowAndANewLeaseStartsAgain) {
   const std::vector<long long> expected{saved(path(L"a"))->id(), saved(path(L"b"))->id()};
-  DBStatement& statement = pathsInIdOrder();
-  EXPECT_EQ(ids(DBRecordIO::readAll<DBPath>(statement)), expected);
-  EXPECT_EQ(ids(DBRecordIO::readAll<DBPath>(statement)), expected);
+  EXPECT_EQ(ids(DBRecordIO::readAll<DBPath>(*pathsInIdOrder())), expected);
+  EXPECT_EQ(ids(DBRecordIO::readAll<DBPath>(*pathsInIdOrder())), expected);
 }

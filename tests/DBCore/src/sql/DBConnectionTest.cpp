@@ -27,14 +27,14 @@ class DBConnectionTest : public testing::Test {
 
   std::string path() const { return directory.file("connection.db"); }
 
-  void insert(int64_t n) { connection->prepare("INSERT INTO numbers(n) VALUES (?)").bind(1, n).execute(); }
+  void insert(int64_t n) { connection->prepare("INSERT INTO numbers(n) VALUES (?)")->bind(1, n).execute(); }
 
   // The stored numbers, read through a second connection so that only committed rows count.
   std::set<int64_t> committedNumbers() const {
     DBConnection reader(path());
-    DBStatement& statement = reader.prepare("SELECT n FROM numbers");
+    const DBStatementLease statement = reader.prepare("SELECT n FROM numbers");
     std::set<int64_t> numbers;
-    while (statement.step()) numbers.insert(statement.columnInt64(0));
+    while (statement->step()) numbers.insert(statement->columnInt64(0));
     return numbers;
   }
 
@@ -50,21 +50,65 @@ TEST_F(DBConnectionTest, OpensAFileInTheTemporaryFolder) {
   EXPECT_EQ(connection->queryInt64("SELECT 41 + 1"), 42);
 }
 
-TEST_F(DBConnectionTest, StatementCacheReturnsTheSameStatementForTheSameSql) {
-  DBStatement& first = connection->prepare("SELECT n FROM numbers");
-  EXPECT_EQ(&connection->prepare("SELECT n FROM numbers"), &first);
-  EXPECT_NE(&connection->prepare("SELECT n FROM numbers WHERE n > 0"), &first);
+TEST_F(DBConnectionTest, StatementCacheLendsTheSameStatementForTheSameSql) {
+  const DBStatement* first = &*connection->prepare("SELECT n FROM numbers");
+  EXPECT_EQ(&*connection->prepare("SELECT n FROM numbers"), first);
+  EXPECT_NE(&*connection->prepare("SELECT n FROM numbers WHERE n > 0"), first);
+  static const DBStaticSql kSql("SELECT n FROM numbers");
+  const DBStatement* fixed = &*connection->prepare(kSql);
+  EXPECT_EQ(&*connection->prepare(kSql), fixed);
 }
 
-TEST_F(DBConnectionTest, PrepareHandsOutACachedStatementResetAndUnbound) {
+TEST_F(DBConnectionTest, AnEndedLeaseLeavesTheStatementResetAndUnbound) {
   insert(1);
-  DBStatement& statement = connection->prepare("SELECT count(*) FROM numbers WHERE n = ?");
-  statement.bind(1, int64_t{1});
-  ASSERT_TRUE(statement.step());
-  EXPECT_EQ(statement.columnInt64(0), 1);
-  DBStatement& again = connection->prepare("SELECT count(*) FROM numbers WHERE n = ?");
-  ASSERT_TRUE(again.step());
-  EXPECT_EQ(again.columnInt64(0), 0);  // n = NULL: the earlier binding is gone
+  {
+    const DBStatementLease statement = connection->prepare("SELECT count(*) FROM numbers WHERE n = ?");
+    statement->bind(1, int64_t{1});
+    ASSERT_TRUE(statement->step());
+    EXPECT_EQ(statement->columnInt64(0), 1);
+  }
+  const DBStatementLease again = connection->prepare("SELECT count(*) FROM numbers WHERE n = ?");
+  ASSERT_TRUE(again->step());
+  EXPECT_EQ(again->columnInt64(0), 0);  // n = NULL: the earlier binding is gone
+}
+
+TEST_F(DBConnectionTest, AStatementThatIsLentIsNotLentAgain) {
+  static const DBStaticSql kSql("SELECT n FROM numbers");
+  const DBStatementLease lent = connection->prepare(kSql);
+  EXPECT_THROW(connection->prepare(kSql), DBException);
+  const DBStatementLease generated = connection->prepare(std::string("SELECT 1"));
+  EXPECT_THROW(connection->prepare(std::string("SELECT 1")), DBException);
+}
+
+// Counts the connection's statements that are between a step and their reset.
+int busyStatements(sqlite3* db) {
+  int busy = 0;
+  for (sqlite3_stmt* statement = sqlite3_next_stmt(db, nullptr); statement;
+       statement = sqlite3_next_stmt(db, statement)) {
+    busy += sqlite3_stmt_busy(statement) ? 1 : 0;
+  }
+  return busy;
+}
+
+TEST_F(DBConnectionTest, AReadThatThrowsMidwayLeavesNoStatementBusyAndTheCheckpointCompletes) {
+  connection->exec("PRAGMA journal_mode = WAL");
+  for (int64_t n = 1; n <= 3; ++n) insert(n);
+  const auto readUntilTheSecondRow = [this] {
+    const DBStatementLease statement = connection->prepare("SELECT n FROM numbers ORDER BY n");
+    while (statement->step()) {
+      if (statement->columnInt64(0) == 2) throw std::runtime_error("reading stopped");
+    }
+  };
+  EXPECT_THROW(readUntilTheSecondRow(), std::runtime_error);
+  EXPECT_EQ(busyStatements(connection->handle()), 0);
+  DBConnection writer(path());
+  writer.exec("INSERT INTO numbers(n) VALUES (4)");
+  int logFrames = -1;
+  int checkpointed = -1;
+  EXPECT_EQ(sqlite3_wal_checkpoint_v2(writer.handle(), nullptr, SQLITE_CHECKPOINT_TRUNCATE, &logFrames,
+                                      &checkpointed),
+            SQLITE_OK);
+  EXPECT_EQ(logFrames, 0);
 }
 
 TEST_F(DBConnectionTest, FailedPrepareIsNotCached) {

@@ -18,10 +18,9 @@ class DBSchemaTest : public DBCatalogTestBase {
  protected:
   // The text of the first column of each row of a query (SQL of the test's own).
   std::set<std::string> queryNames(DBConnection& db, const std::string& sql) {
-    DBStatement& statement = db.prepare(sql);
+    const DBStatementLease statement = db.prepare(sql);
     std::set<std::string> names;
-    while (statement.step()) names.insert(statement.columnText(0));
-    statement.reset();
+    while (statement->step()) names.insert(statement->columnText(0));
     return names;
   }
 

@@ -42,10 +42,9 @@ class DBCatalogTestBase : public testing::Test {
 
   // The integers of the first column of a query's rows (SQL of the test's own).
   std::set<long long> queryIds(const std::string& sql) {
-    dbcore::DBStatement& statement = connection->prepare(sql);
+    const dbcore::DBStatementLease statement = connection->prepare(sql);
     std::set<long long> result;
-    while (statement.step()) result.insert(statement.columnInt64(0));
-    statement.reset();
+    while (statement->step()) result.insert(statement->columnInt64(0));
     return result;
   }
 

@@ -130,7 +130,7 @@ bool bindColumn(token_node& token, FieldType column_type, FieldType& type, bool 
 bool validateOperand(token_node& token, FieldType& type, bool joined, const std::string& table) {
   if (!token.var) return false;
   if (token.var->type() != FieldType::T_TEXT) return type == token.var->type();
-  const ColumnTypes columns = DBEntity::T_COLUMN_TYPES(table);
+  const ColumnTypes& columns = DBEntity::T_COLUMN_TYPES(table);
   const auto column = columns.find(token.var->asText());
   if (column == columns.end()) return convertLiteral(token, type);
   return bindColumn(token, column->second, type, joined, table);

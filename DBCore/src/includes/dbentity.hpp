@@ -52,8 +52,9 @@ class DBEntity {
   // Sets the fields whose columns the map names; other fields keep their values.
   virtual void set_column_values(const ColumnValues& values) = 0;
 
-  // The column types of a table by column name; empty for an unknown table.
-  static ColumnTypes T_COLUMN_TYPES(const std::string& table);
+  // The column types of a table by column name; empty for an unknown table. The map lives as long as
+  // the program.
+  static const ColumnTypes& T_COLUMN_TYPES(const std::string& table);
 
  protected:
   explicit DBEntity(uint8_t type) : type_(type) {}

@@ -21,9 +21,10 @@ const std::map<std::string, ColumnTypes>& tables() {
 
 }  // namespace
 
-ColumnTypes DBEntity::T_COLUMN_TYPES(const std::string& table) {
+const ColumnTypes& DBEntity::T_COLUMN_TYPES(const std::string& table) {
+  static const ColumnTypes kNone;
   const auto found = tables().find(table);
-  return found == tables().end() ? ColumnTypes{} : found->second;
+  return found == tables().end() ? kNone : found->second;
 }
 
 }  // namespace dbcore

@@ -36,3 +36,8 @@ TEST(DBEntityTest, EveryTableHasTheBaseColumns) {
 }
 
 }  // namespace
+
+TEST(DBEntityTest, ColumnTypesAreOneMapPerTableForTheLifeOfTheProgram) {
+  EXPECT_EQ(&dbcore::DBEntity::T_COLUMN_TYPES("images"), &dbcore::DBEntity::T_COLUMN_TYPES("images"));
+  EXPECT_EQ(&dbcore::DBEntity::T_COLUMN_TYPES("unknown"), &dbcore::DBEntity::T_COLUMN_TYPES("other"));
+}

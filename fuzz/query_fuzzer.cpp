@@ -17,7 +17,6 @@
 #include <cstdio>
 #include <exception>
 #include <filesystem>
-#include <limits>
 #include <map>
 #include <memory>
 #include <random>

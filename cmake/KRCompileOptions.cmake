@@ -8,8 +8,9 @@ endif()
 if(KR_WARNINGS_AS_ERRORS)
   target_compile_options(kr_compile_options INTERFACE -Werror)
 endif()
-# Log lines carry source paths relative to the repository root.
-target_compile_definitions(kr_compile_options INTERFACE KR_SOURCE_ROOT="${CMAKE_SOURCE_DIR}/")
+# Log lines carry source paths relative to the repository root: __FILE__ is written without it, which also
+# keeps the compiler's command lines the same in every checkout.
+target_compile_options(kr_compile_options INTERFACE -fmacro-prefix-map=${CMAKE_SOURCE_DIR}/=)
 
 if(KR_SANITIZE STREQUAL "asan")
   target_compile_options(kr_compile_options INTERFACE -fsanitize=address,undefined -fno-omit-frame-pointer -fno-sanitize-recover=undefined)

@@ -11,9 +11,12 @@
 #endif
 
 // The source path that log lines carry: the file's path below the repository root, without its
-// extension ("/repo/Platform/KRServices/KRLog.cpp" -> "Platform/KRServices/KRLog").
+// extension ("/repo/Platform/KRServices/KRLog.cpp" -> "Platform/KRServices/KRLog"). The build writes
+// __FILE__ without the root, or relative to the build folder when a compiler cache rewrites the paths
+// ("../../Platform/KRServices/KRLog.cpp"): leading "../" steps are dropped too.
 consteval std::string_view KRLogSourcePath(std::string_view file, std::string_view root) {
   if (!root.empty() && file.starts_with(root)) file.remove_prefix(root.size());
+  while (file.starts_with("../")) file.remove_prefix(3);
   const size_t slash = file.rfind('/');
   const size_t dot = file.rfind('.');
   const size_t nameStart = slash == std::string_view::npos ? 0 : slash + 1;

@@ -27,6 +27,11 @@ std::wstring withoutTrailingSeparator(std::wstring path) {
   return path;
 }
 
+// Runs a statement of a membership table whose parameters are the owner and the image.
+void runForMember(DBConnection& connection, const DBStaticSql& sql, int64_t ownerId, int64_t imageId) {
+  connection.prepare(sql)->bind(1, ownerId).bind(2, imageId).execute();
+}
+
 }  // namespace
 
 void DBLinks::setFolder(DBConnection& connection, int64_t imageId, int64_t pathId) {
@@ -43,19 +48,13 @@ void DBLinks::setFolder(DBConnection& connection, int64_t imageId, int64_t pathI
 void DBLinks::addMember(DBConnection& connection, const char* table, int64_t ownerId, int64_t imageId) {
   static const DBStaticSql kFilterSql(insertMemberSql(DBLinks::kFilterImages));
   static const DBStaticSql kFolderSql(insertMemberSql(DBLinks::kReferencedFolderImages));
-  connection.prepare(isFilterTable(table) ? kFilterSql : kFolderSql)
-      ->bind(1, ownerId)
-      .bind(2, imageId)
-      .execute();
+  runForMember(connection, isFilterTable(table) ? kFilterSql : kFolderSql, ownerId, imageId);
 }
 
 void DBLinks::removeMember(DBConnection& connection, const char* table, int64_t ownerId, int64_t imageId) {
   static const DBStaticSql kFilterSql(deleteMemberSql(DBLinks::kFilterImages));
   static const DBStaticSql kFolderSql(deleteMemberSql(DBLinks::kReferencedFolderImages));
-  connection.prepare(isFilterTable(table) ? kFilterSql : kFolderSql)
-      ->bind(1, ownerId)
-      .bind(2, imageId)
-      .execute();
+  runForMember(connection, isFilterTable(table) ? kFilterSql : kFolderSql, ownerId, imageId);
 }
 
 std::map<long long, std::set<long long>> DBLinks::folderConnections(DBConnection& connection, bool byImage) {

@@ -36,6 +36,8 @@ TEST(KRLogTest, SourcePathOutsideTheRootKeepsItsDirectoriesAndLosesItsExtension)
   EXPECT_EQ(KRLogSourcePath("/repo/dir.d/name", "/repo/"), "dir.d/name");
   EXPECT_EQ(KRLogSourcePath("/repo/dir/.hidden", "/repo/"), "dir/.hidden");
   EXPECT_EQ(KRLogSourcePath("name.tar.gz", ""), "name.tar");
+  EXPECT_EQ(KRLogSourcePath("../../Platform/KRServices/KRLog.cpp", ""), "Platform/KRServices/KRLog");
+  EXPECT_EQ(KRLogSourcePath("Platform/KRServices/KRLog.cpp", ""), "Platform/KRServices/KRLog");
 }
 
 TEST(KRLogTest, DirectCallPassesEveryFieldThrough) {

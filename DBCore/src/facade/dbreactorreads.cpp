@@ -1,12 +1,6 @@
 #include "dbreactor.hpp"
 
-#include "dbcleanup.hpp"
-#include "dblinks.hpp"
 #include "dbreactorsupport.hpp"
-#include "dbrecordvisitor.hpp"
-#include "dbselectqueryrunner.hpp"
-#include "dbstates.hpp"
-#include "dbstrings.hpp"
 
 // Reads of single records and of related records.
 

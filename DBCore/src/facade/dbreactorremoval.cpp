@@ -3,10 +3,6 @@
 #include "dbcleanup.hpp"
 #include "dblinks.hpp"
 #include "dbreactorsupport.hpp"
-#include "dbrecordvisitor.hpp"
-#include "dbselectqueryrunner.hpp"
-#include "dbstates.hpp"
-#include "dbstrings.hpp"
 
 // Removal of records and clean-up of records nothing refers to.
 

@@ -1,12 +1,8 @@
 #include "dbreactor.hpp"
 
-#include "dbcleanup.hpp"
 #include "dblinks.hpp"
 #include "dbreactorsupport.hpp"
 #include "dbrecordvisitor.hpp"
-#include "dbselectqueryrunner.hpp"
-#include "dbstates.hpp"
-#include "dbstrings.hpp"
 
 // Writes of records, batches, folder bindings and referenced-folder trees.
 

@@ -1,15 +1,16 @@
 #include "dbreactor.hpp"
 
 #include <sqlite3.h>
-#include <unistd.h>
 
-#include <atomic>
 #include <cstdio>
-#include <filesystem>
 
+#include "dbbackuptemporaries.hpp"
+#include "dbcatalogidentity.hpp"
 #include "dbconnection.hpp"
 #include "dbexception.hpp"
+#include "dbidentitystamp.hpp"
 #include "dblinks.hpp"
+#include "dbopenclassifier.hpp"
 #include "dbrecordio.hpp"
 #include "dbrecordvisitor.hpp"
 #include "dbschema.hpp"
@@ -22,9 +23,7 @@ namespace dbcore {
 
 namespace {
 
-const DBStaticSql kApplicationIdSql("PRAGMA application_id");
 const DBStaticSql kUserVersionSql("PRAGMA user_version");
-const DBStaticSql kSchemaObjectsSql("SELECT count(*) FROM sqlite_schema");
 const DBStaticSql kProductVersionSql("SELECT value FROM catalog_info WHERE key = 'product_version'");
 
 // Copies the consistent content of an open database into a new file.
@@ -40,11 +39,6 @@ bool copyDatabase(sqlite3* source, const std::string& destination) {
   return sqlite3_close_v2(target) == SQLITE_OK && copied;
 }
 
-std::string temporaryPathBeside(const std::string& path) {
-  static std::atomic<unsigned> counter{0};
-  return path + ".backup-" + std::to_string(getpid()) + "-" + std::to_string(counter++);
-}
-
 }  // namespace
 
 DBReactor::DBReactor(AppInfo const& appInfo) : appInfo_(appInfo) {}
@@ -58,39 +52,42 @@ DBConnection& DBReactor::connection() const {
 
 int DBReactor::Open(const std::wstring& path, const std::wstring&) {
   Close();
+  if (path.find(L'\0') != std::wstring::npos) return kDBOpenFailed;
   const std::string file = ws2s(path);
-  std::error_code error;
-  if (file.empty() || std::filesystem::is_directory(file, error)) return kDBOpenFailed;
+  const int result = DBOpenClassifier(file, DBSchema::applicationIdFor(appInfo_)).classify();
+  if (result != kDBOpenCurrent && result != kDBOpenNeedsUpdate) return result;
   try {
     connection_ = std::make_unique<DBConnection>(file);
-    const int result = classifyOpenedFile();
-    if (result != kDBOpenCurrent && result != kDBOpenNeedsUpdate) connection_.reset();
+    useWriteAheadLog();
+    stamp_ = std::make_unique<DBIdentityStamp>(connection_->handle());
+    if (result == kDBOpenCurrent) adoptIdentity();
     return result;
   } catch (const std::exception&) {
-    connection_.reset();
+    Close();
     return kDBOpenFailed;
   }
 }
 
-int DBReactor::classifyOpenedFile() {
-  DBConnection& db = *connection_;
-  const int64_t applicationId = db.queryInt64(kApplicationIdSql);
-  const int64_t version = db.queryInt64(kUserVersionSql);
-  const int64_t objects = db.queryInt64(kSchemaObjectsSql);
-  if (applicationId == 0 && version == 0 && objects == 0) return useWriteAheadLog(kDBOpenNeedsUpdate);
-  if (applicationId != DBSchema::applicationIdFor(appInfo_)) return kDBOpenIncompatible;
-  if (version > DBSchema::kCurrentVersion || version < DBSchema::kOldestVersion) return kDBOpenIncompatible;
-  if (version < DBSchema::kCurrentVersion) return useWriteAheadLog(kDBOpenNeedsUpdate);
-  return DBSchema::isWellFormed(db) ? useWriteAheadLog(kDBOpenCurrent) : kDBOpenFailed;
-}
-
-int DBReactor::useWriteAheadLog(int result) {
+void DBReactor::useWriteAheadLog() {
   // A read-only file keeps its journal mode; its writes fail later with a DBException.
   try {
     connection_->exec("PRAGMA journal_mode = WAL");
   } catch (const DBException&) {
   }
-  return result;
+}
+
+// A catalog made before catalogs had an identifier gets one. The checkpoint puts it into the main file at
+// once: until then the main file alone would show none, and a log beside it would be refused. A catalog
+// that has one stamps the log its writes go to.
+void DBReactor::adoptIdentity() {
+  try {
+    if (DBCatalogIdentity::assignIfMissing(*connection_)) {
+      stamp_->checkpoint();
+      return;
+    }
+  } catch (const DBException&) {
+  }
+  stamp_->stamp();
 }
 
 void DBReactor::Initialize() {
@@ -100,18 +97,25 @@ void DBReactor::Initialize() {
     DBSchema::migrate(db, static_cast<int>(version));
     db.exec("PRAGMA application_id = " + std::to_string(DBSchema::applicationIdFor(appInfo_)));
     DBSchema::createRootRecords(db);
+    DBCatalogIdentity::assignIfMissing(db);
   });
+  stamp_->checkpoint();
 }
 
-void DBReactor::Close() { connection_.reset(); }
+void DBReactor::Close() {
+  stamp_.reset();
+  connection_.reset();
+}
 
 bool DBReactor::Backup(const std::wstring& path) {
   DBConnection& db = connection();
   const std::string destination = ws2s(path);
-  if (destination.empty()) return false;
-  const std::string temporary = temporaryPathBeside(destination);
+  if (destination.empty() || path.find(L'\0') != std::wstring::npos) return false;
+  const DBBackupTemporaries temporaries(destination);
+  temporaries.removeStale();
+  const std::string temporary = temporaries.next();
   if (!copyDatabase(db.handle(), temporary) || std::rename(temporary.c_str(), destination.c_str()) != 0) {
-    std::remove(temporary.c_str());
+    DBBackupTemporaries::remove(temporary);
     return false;
   }
   return true;

@@ -18,6 +18,7 @@ namespace dbcore {
 
 class DBConnection;
 class DBEntitySelectQuery;
+class DBIdentityStamp;
 
 // The application identity a file is opened for, and the product version stored in the file.
 using AppInfo = int32_t;
@@ -188,8 +189,8 @@ class DBReactor {
 
  private:
   DBConnection& connection() const;
-  int classifyOpenedFile();
-  int useWriteAheadLog(int result);
+  void useWriteAheadLog();
+  void adoptIdentity();
   template <class A>
   std::shared_ptr<A> attributesOfImage(const std::shared_ptr<DBImage>& image) const;
   template <class T>
@@ -201,6 +202,8 @@ class DBReactor {
 
   AppInfo appInfo_;
   std::unique_ptr<DBConnection> connection_;
+  // Declared after the connection, so that it is destroyed first.
+  std::unique_ptr<DBIdentityStamp> stamp_;
 };
 
 // The operations written for one record type or pair alone.

@@ -4,13 +4,18 @@
 #include <gtest/gtest.h>
 #include <sqlite3.h>
 #include <sys/resource.h>
+#include <sys/wait.h>
 #include <unistd.h>
 
 #include <csignal>
 #include <filesystem>
 #include <fstream>
+#include <functional>
+#include <set>
 
+#include "DBFileSetTestSupport.hpp"
 #include "DBReactorTestSupport.hpp"
+#include "dbconnection.hpp"
 #include "dbexception.hpp"
 #include "dbschema.hpp"
 #include "support/KRUnprivilegedUser.hpp"
@@ -51,7 +56,88 @@ int openResult(const std::string& path, AppInfo appInfo = 5) {
   return reactor.Open(s2ws(path), L"");
 }
 
-class DBReactorTest : public DBReactorTestBase {};
+std::string singleText(const std::string& path, const std::string& sql) {
+  sqlite3* db = nullptr;
+  std::string text;
+  sqlite3_stmt* statement = nullptr;
+  if (sqlite3_open_v2(path.c_str(), &db, SQLITE_OPEN_READONLY, nullptr) == SQLITE_OK &&
+      sqlite3_prepare_v2(db, sql.c_str(), -1, &statement, nullptr) == SQLITE_OK &&
+      sqlite3_step(statement) == SQLITE_ROW && sqlite3_column_text(statement, 0)) {
+    text = reinterpret_cast<const char*>(sqlite3_column_text(statement, 0));
+  }
+  sqlite3_finalize(statement);
+  sqlite3_close(db);
+  return text;
+}
+
+std::string catalogId(const std::string& path) {
+  return singleText(path, "SELECT value FROM catalog_info WHERE key = 'catalog_id'");
+}
+
+// A plain SQLite connection kept open, so that its write-ahead log keeps committed frames (no checkpoint).
+class OpenWriter {
+ public:
+  explicit OpenWriter(const std::string& path) { sqlite3_open(path.c_str(), &db_); }
+  ~OpenWriter() { sqlite3_close(db_); }
+  OpenWriter(const OpenWriter&) = delete;
+  OpenWriter& operator=(const OpenWriter&) = delete;
+  void run(const std::string& sql) {
+    ASSERT_EQ(sqlite3_exec(db_, sql.c_str(), nullptr, nullptr, nullptr), SQLITE_OK);
+  }
+
+ private:
+  sqlite3* db_ = nullptr;
+};
+
+// Copies a database file and whichever of its -wal, -shm and -journal exist, as a crash would leave them.
+void copyWithSidecars(const std::string& from, const std::string& to, bool withIndex = true) {
+  for (const std::string suffix : {"", "-wal", "-shm", "-journal"}) {
+    if (suffix == "-shm" && !withIndex) continue;
+    if (std::filesystem::exists(from + suffix)) writeFileBytes(to + suffix, fileBytes(from + suffix));
+  }
+}
+
+// Rewrites the definition of a table in place, as another program might have left it.
+void editTableDefinition(const std::string& path, const std::string& table, const std::string& from,
+                         const std::string& to) {
+  rawSql(path, "PRAGMA writable_schema = ON; UPDATE sqlite_schema SET sql = replace(sql, '" + from + "', '" +
+                   to + "') WHERE name = '" + table + "' AND instr(sql, '" + from + "') > 0;");
+  ASSERT_EQ(
+      singleText(path, "SELECT instr(sql, '" + to + "') > 0 FROM sqlite_schema WHERE name = '" + table + "'"),
+      "1");
+}
+
+class DBReactorTest : public DBReactorTestBase {
+ protected:
+  // Opens the file and expects the answer with every file of the folder as it was.
+  void expectRefusedUnchanged(const std::string& path, std::set<int> answers) {
+    const auto before = filesIn(std::filesystem::path(path).parent_path());
+    const int answer = openResult(path);
+    EXPECT_TRUE(answers.count(answer)) << "Open answered " << answer;
+    EXPECT_EQ(filesIn(std::filesystem::path(path).parent_path()), before);
+  }
+
+  // A closed catalog in a folder of its own, holding images.
+  std::string closedCatalog(const KRTemporaryDirectory& folder, int images) {
+    const std::string path = folder.file("catalog.krcatalog");
+    DBReactor catalog(kAppInfo);
+    EXPECT_EQ(catalog.Open(s2ws(path), L""), kDBOpenNeedsUpdate);
+    catalog.Initialize();
+    for (int index = 0; index < images; ++index) catalog << std::make_shared<DBImage>();
+    return path;
+  }
+
+  // The -wal of another catalog, with committed frames: written while that catalog is open.
+  std::string logOfAnotherCatalog(bool touchingItsInfo) {
+    KRTemporaryDirectory folder;
+    const std::string path = closedCatalog(folder, 40);
+    DBReactor other(kAppInfo);
+    EXPECT_EQ(other.Open(s2ws(path), L""), kDBOpenCurrent);
+    for (int index = 0; index < 30; ++index) other << std::make_shared<DBImage>();
+    if (touchingItsInfo) other.SetDBApplicationID(77);
+    return fileBytes(path + "-wal");
+  }
+};
 
 }  // namespace
 
@@ -139,6 +225,216 @@ TEST_F(DBReactorTest, MalformedSchemaFails) {
   reactor->Close();
   rawSql(catalogPath(), "ALTER TABLE images DROP COLUMN width;");
   EXPECT_EQ(openResult(catalogPath()), kDBOpenFailed);
+}
+
+// ---- Paths and sizes
+
+TEST_F(DBReactorTest, PathWithANulFailsAndTouchesNothing) {
+  reactor->Close();
+  const auto before = filesIn(directory.path());
+  const std::wstring nul(1, L'\0');
+  EXPECT_EQ(reactor->Open(s2ws(catalogPath()) + nul + L".x", L""), kDBOpenFailed);
+  EXPECT_EQ(reactor->Open(s2ws(directory.file("new")) + nul + L".krcatalog", L""), kDBOpenFailed);
+  EXPECT_EQ(reactor->Open(s2ws(directory.path().string()) + nul + L"/catalog.krcatalog", L""), kDBOpenFailed);
+  EXPECT_THROW(reactor->Count<DBImage>(), DBException);
+  EXPECT_EQ(filesIn(directory.path()), before);
+}
+
+TEST_F(DBReactorTest, ZeroLengthFileNeedsInitialize) {
+  const std::string path = directory.file("empty.krcatalog");
+  writeFileBytes(path, "");
+  EXPECT_EQ(openResult(path), kDBOpenNeedsUpdate);
+}
+
+TEST_F(DBReactorTest, FileShorterThanAHeaderFailsAndKeepsItsBytes) {
+  reactor->Close();
+  const std::string catalog = fileBytes(catalogPath());
+  KRTemporaryDirectory folder;
+  for (const size_t size : {size_t{1}, size_t{16}, size_t{99}}) {
+    const std::string path = folder.file("short.krcatalog");
+    writeFileBytes(path, catalog.substr(0, size));
+    expectRefusedUnchanged(path, {kDBOpenFailed});
+  }
+}
+
+TEST_F(DBReactorTest, LogBesideAnEmptyFileFailsAndStays) {
+  const std::string log = logOfAnotherCatalog(false);
+  for (const bool fileExists : {false, true}) {
+    KRTemporaryDirectory folder;
+    const std::string path = folder.file("new.krcatalog");
+    if (fileExists) writeFileBytes(path, "");
+    writeFileBytes(path + "-wal", log);
+    expectRefusedUnchanged(path, {kDBOpenFailed});
+  }
+}
+
+// ---- Logs and journals beside the file
+
+TEST_F(DBReactorTest, OwnCommittedLogIsReplayed) {
+  for (int index = 0; index < 3; ++index) makeImage(L"in-the-log.jpg");
+  ASSERT_GT(std::filesystem::file_size(catalogPath() + "-wal"), 0u);
+  for (const bool withIndex : {true, false}) {
+    KRTemporaryDirectory folder;
+    const std::string copy = folder.file("catalog.krcatalog");
+    copyWithSidecars(catalogPath(), copy, withIndex);
+    DBReactor recovered(kAppInfo);
+    ASSERT_EQ(recovered.Open(s2ws(copy), L""), kDBOpenCurrent);
+    EXPECT_EQ(recovered.Count<DBImage>(), 3u);
+  }
+}
+
+TEST_F(DBReactorTest, NewCatalogWhoseFirstTransactionIsInItsLogOpens) {
+  KRTemporaryDirectory folder;
+  const std::string path = folder.file("first.krcatalog");
+  DBConnection writer(path);
+  writer.exec("PRAGMA journal_mode = WAL");
+  writer.exec("PRAGMA wal_autocheckpoint = 0");
+  writer.transaction([&writer] {
+    DBSchema::migrate(writer, 0);
+    writer.exec("PRAGMA application_id = " + std::to_string(DBSchema::applicationIdFor(kAppInfo)));
+    DBSchema::createRootRecords(writer);
+  });
+  const std::string copy = directory.file("first.krcatalog");
+  copyWithSidecars(path, copy);
+  ASSERT_EQ(singleText(copy, "PRAGMA application_id"), std::to_string(DBSchema::applicationIdFor(kAppInfo)));
+  EXPECT_EQ(openResult(copy), kDBOpenCurrent);
+}
+
+TEST_F(DBReactorTest, CommittedLogOfAnotherCatalogIsRefusedAndChangesNothing) {
+  reactor->Close();
+  for (const bool touchingItsInfo : {false, true}) {
+    writeFileBytes(catalogPath() + "-wal", logOfAnotherCatalog(touchingItsInfo));
+    expectRefusedUnchanged(catalogPath(), {kDBOpenFailed});
+    std::filesystem::remove(catalogPath() + "-wal");
+    EXPECT_EQ(openResult(catalogPath()), kDBOpenCurrent);
+  }
+}
+
+TEST_F(DBReactorTest, CommittedLogOfAnotherApplicationsDatabaseIsRefused) {
+  reactor->Close();
+  KRTemporaryDirectory folder;
+  const std::string other = folder.file("other.db");
+  OpenWriter writer(other);
+  writer.run(
+      "PRAGMA journal_mode = WAL; PRAGMA wal_autocheckpoint = 0; CREATE TABLE notes(body TEXT);"
+      "INSERT INTO notes VALUES ('kept in the log');");
+  for (const bool withIndex : {true, false}) {
+    // The other database itself, with its log.
+    KRTemporaryDirectory copies;
+    const std::string copy = copies.file("other.db");
+    copyWithSidecars(other, copy, withIndex);
+    expectRefusedUnchanged(copy, {kDBOpenFailed, kDBOpenIncompatible});
+    // Its log beside a catalog.
+    writeFileBytes(catalogPath() + "-wal", fileBytes(other + "-wal"));
+    if (withIndex) writeFileBytes(catalogPath() + "-shm", fileBytes(other + "-shm"));
+    expectRefusedUnchanged(catalogPath(), {kDBOpenFailed});
+  }
+}
+
+TEST_F(DBReactorTest, NewerSchemaInTheLogIsIncompatibleAndChangesNothing) {
+  reactor->Close();
+  OpenWriter writer(catalogPath());
+  writer.run("PRAGMA wal_autocheckpoint = 0; PRAGMA user_version = 999;");
+  for (const bool withIndex : {true, false}) {
+    KRTemporaryDirectory folder;
+    const std::string copy = folder.file("catalog.krcatalog");
+    copyWithSidecars(catalogPath(), copy, withIndex);
+    ASSERT_TRUE(std::filesystem::exists(copy + "-wal"));
+    expectRefusedUnchanged(copy, {kDBOpenIncompatible});
+  }
+}
+
+TEST_F(DBReactorTest, HotJournalOfAnotherDatabaseIsRefusedAndChangesNothing) {
+  reactor->Close();
+  KRTemporaryDirectory folder;
+  const std::string other = folder.file("other.db");
+  OpenWriter writer(other);
+  writer.run(
+      "CREATE TABLE notes(body TEXT);"
+      "WITH RECURSIVE n(i) AS (SELECT 1 UNION ALL SELECT i + 1 FROM n WHERE i < 2000)"
+      "  INSERT INTO notes SELECT hex(randomblob(60)) FROM n;"
+      "PRAGMA cache_size = 4; BEGIN; UPDATE notes SET body = lower(body);");
+  const std::string journal = fileBytes(other + "-journal");
+  ASSERT_FALSE(journal.empty());
+  writeFileBytes(catalogPath() + "-journal", journal);
+  expectRefusedUnchanged(catalogPath(), {kDBOpenFailed});
+  std::filesystem::remove(catalogPath() + "-journal");
+  rawSql(catalogPath(), "PRAGMA journal_mode = DELETE");
+  writeFileBytes(catalogPath() + "-journal", journal);
+  expectRefusedUnchanged(catalogPath(), {kDBOpenFailed});
+}
+
+// ---- Identity
+
+TEST_F(DBReactorTest, InitializeGivesEveryCatalogItsOwnIdentifier) {
+  reactor->Close();
+  KRTemporaryDirectory folder;
+  const std::string other = closedCatalog(folder, 0);
+  EXPECT_EQ(catalogId(catalogPath()).size(), 32u);
+  EXPECT_NE(catalogId(catalogPath()), catalogId(other));
+  // In the main file itself, not only in a log.
+  EXPECT_FALSE(std::filesystem::exists(catalogPath() + "-wal") &&
+               std::filesystem::file_size(catalogPath() + "-wal") > 0);
+}
+
+TEST_F(DBReactorTest, CurrentCatalogWithoutAnIdentifierGetsOne) {
+  reactor->Close();
+  rawSql(catalogPath(), "DELETE FROM catalog_info WHERE key = 'catalog_id'");
+  ASSERT_EQ(catalogId(catalogPath()), "");
+  DBReactor again(kAppInfo);
+  ASSERT_EQ(again.Open(s2ws(catalogPath()), L""), kDBOpenCurrent);
+  const std::string assigned = catalogId(catalogPath());
+  EXPECT_EQ(assigned.size(), 32u);
+  again.Close();
+  EXPECT_EQ(openResult(catalogPath()), kDBOpenCurrent);
+  EXPECT_EQ(catalogId(catalogPath()), assigned);
+}
+
+// ---- Tables and columns
+
+TEST_F(DBReactorTest, DifferentColumnsFailAndChangeNothing) {
+  reactor->Close();
+  const std::string original = fileBytes(catalogPath());
+  const auto restore = [&] { writeFileBytes(catalogPath(), original); };
+  const std::vector<std::function<void()>> edits{
+      [&] { editTableDefinition(catalogPath(), "images", "width INTEGER", "width TEXT"); },
+      [&] { editTableDefinition(catalogPath(), "catalog_info", "value INTEGER", "value TEXT"); },
+      [&] {
+        editTableDefinition(catalogPath(), "filter_images", "PRIMARY KEY (filter_id, image_id)",
+                            "PRIMARY KEY (image_id, filter_id)");
+      },
+      [&] {
+        editTableDefinition(catalogPath(), "images", "REFERENCES paths(_id_int_64) ON DELETE SET NULL",
+                            "REFERENCES volumes(_id_int_64) ON DELETE SET NULL");
+      },
+      [&] {
+        editTableDefinition(catalogPath(), "filters", "REFERENCES filters(_id_int_64) ON DELETE CASCADE",
+                            "REFERENCES filters(_id_int_64) ON DELETE SET NULL");
+      },
+      [&] {
+        editTableDefinition(catalogPath(), "image_states", "is_current INTEGER NOT NULL DEFAULT 0",
+                            "is_current INTEGER NOT NULL DEFAULT 0, extra INTEGER");
+      },
+      [&] { rawSql(catalogPath(), "ALTER TABLE state_resources RENAME COLUMN resource_id TO resource"); },
+      [&] { rawSql(catalogPath(), "ALTER TABLE referenced_folder_images RENAME TO old_images"); },
+      [&] { rawSql(catalogPath(), "ALTER TABLE reffolders RENAME COLUMN parent_id TO parent"); },
+      [&] { rawSql(catalogPath(), "CREATE TABLE extra(value)"); },
+  };
+  for (size_t index = 0; index < edits.size(); ++index) {
+    SCOPED_TRACE("edit " + std::to_string(index));
+    edits[index]();
+    expectRefusedUnchanged(catalogPath(), {kDBOpenFailed});
+    restore();
+  }
+  EXPECT_EQ(openResult(catalogPath()), kDBOpenCurrent);
+}
+
+TEST_F(DBReactorTest, OlderVersionWithDifferentColumnsFails) {
+  reactor->Close();
+  for (const auto& index : namedIndexes(catalogPath())) rawSql(catalogPath(), "DROP INDEX " + index);
+  rawSql(catalogPath(),
+         "PRAGMA user_version = 119; ALTER TABLE images RENAME COLUMN folder_path_id TO folder;");
+  expectRefusedUnchanged(catalogPath(), {kDBOpenFailed});
 }
 
 // ---- Initialize and versions
@@ -386,6 +682,32 @@ TEST_F(DBReactorTest, BackupReplacesAnExistingFileAndLeavesNoTemporaryFile) {
     files += entry.path().filename().string().find(".backup-") == std::string::npos ? 0 : 1;
   }
   EXPECT_EQ(files, 0);
+}
+
+TEST_F(DBReactorTest, BackupRemovesTheTemporariesOfGoneProcessesOnly) {
+  const std::string copy = directory.file("copy.krcatalog");
+  const pid_t gone = fork();
+  if (gone == 0) _exit(0);
+  waitpid(gone, nullptr, 0);
+  const pid_t live = fork();
+  if (live == 0) {
+    pause();
+    _exit(0);
+  }
+  const std::string stale = copy + ".backup-" + std::to_string(gone) + "-3";
+  const std::vector<std::string> kept{
+      copy + ".backup-" + std::to_string(live) + "-0", copy + ".backup-" + std::to_string(getpid()) + "-99",
+      copy + ".backup-" + std::to_string(gone) + "-3-other",
+      directory.file("other.krcatalog.backup-" + std::to_string(gone) + "-1")};
+  for (const std::string suffix : {"", "-journal", "-wal"}) writeFileBytes(stale + suffix, "partial copy");
+  for (const auto& path : kept) writeFileBytes(path, "in use");
+  EXPECT_TRUE(reactor->Backup(s2ws(copy)));
+  kill(live, SIGKILL);
+  waitpid(live, nullptr, 0);
+  for (const std::string suffix : {"", "-journal", "-wal"})
+    EXPECT_FALSE(std::filesystem::exists(stale + suffix));
+  for (const auto& path : kept) EXPECT_EQ(fileBytes(path), "in use") << path;
+  EXPECT_EQ(openResult(copy), kDBOpenCurrent);
 }
 
 TEST_F(DBReactorTest, BackupToAMissingFolderFails) {

@@ -1,6 +1,8 @@
 #include "dbschema.hpp"
 
+#include <functional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "dbconnection.hpp"
@@ -13,14 +15,14 @@ namespace {
 
 // Version 119: every record table, the links between records and the catalog's key-value info.
 constexpr const char* kCreateTables = R"sql(
-CREATE TABLE catalog_info (key TEXT PRIMARY KEY, value INTEGER NOT NULL) WITHOUT ROWID;
-CREATE TABLE volumes (
+CREATE TABLE IF NOT EXISTS catalog_info (key TEXT PRIMARY KEY, value INTEGER NOT NULL) WITHOUT ROWID;
+CREATE TABLE IF NOT EXISTS volumes (
   _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
   uuid_wide_ch TEXT NOT NULL DEFAULT '', info_wide_ch TEXT NOT NULL DEFAULT '');
-CREATE TABLE paths (
+CREATE TABLE IF NOT EXISTS paths (
   _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
   volume_id_int_64 INTEGER NOT NULL DEFAULT 0, path_wide_ch TEXT NOT NULL DEFAULT '');
-CREATE TABLE images (
+CREATE TABLE IF NOT EXISTS images (
   _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
   guid_wide_ch TEXT NOT NULL DEFAULT '', path_wide_ch TEXT NOT NULL DEFAULT '',
   width INTEGER NOT NULL DEFAULT 0, height INTEGER NOT NULL DEFAULT 0,
@@ -28,7 +30,7 @@ CREATE TABLE images (
   import_date_int_64 INTEGER NOT NULL DEFAULT 0, import_index INTEGER NOT NULL DEFAULT 0,
   creation_date_int_64 INTEGER NOT NULL DEFAULT 0,
   folder_path_id INTEGER REFERENCES paths(_id_int_64) ON DELETE SET NULL);
-CREATE TABLE image_user_attributes (
+CREATE TABLE IF NOT EXISTS image_user_attributes (
   _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
   image_id_int_64 INTEGER NOT NULL UNIQUE REFERENCES images(_id_int_64) ON DELETE CASCADE,
   trash_bool INTEGER NOT NULL DEFAULT 0, marker INTEGER NOT NULL DEFAULT 0, color INTEGER NOT NULL DEFAULT 0,
@@ -36,7 +38,7 @@ CREATE TABLE image_user_attributes (
   opened_bool INTEGER NOT NULL DEFAULT 0, trashed_date_int_64 INTEGER NOT NULL DEFAULT 0,
   origin_path_wide_ch TEXT NOT NULL DEFAULT '', lost_bool INTEGER NOT NULL DEFAULT 0,
   tutorial INTEGER NOT NULL DEFAULT 0);
-CREATE TABLE image_exiv_attributes (
+CREATE TABLE IF NOT EXISTS image_exiv_attributes (
   _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
   image_id_int_64 INTEGER NOT NULL UNIQUE REFERENCES images(_id_int_64) ON DELETE CASCADE,
   iso_speed REAL NOT NULL DEFAULT 0, shutter_speed REAL NOT NULL DEFAULT 0, number REAL NOT NULL DEFAULT 0,
@@ -51,59 +53,59 @@ CREATE TABLE image_exiv_attributes (
   lens_pretty_name_wide_ch TEXT NOT NULL DEFAULT '', date_time_int_64 INTEGER NOT NULL DEFAULT 0,
   is_raw_bool INTEGER NOT NULL DEFAULT 0, is_full_filled_bool INTEGER NOT NULL DEFAULT 0,
   version INTEGER NOT NULL DEFAULT 0);
-CREATE TABLE image_history_states (
+CREATE TABLE IF NOT EXISTS image_history_states (
   _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
   action_name_wide_ch TEXT NOT NULL DEFAULT '', additional_info_wide_ch TEXT NOT NULL DEFAULT '',
   guid_wide_ch TEXT NOT NULL DEFAULT '', crop_description_wide_ch TEXT NOT NULL DEFAULT '',
   image_orientation_int_64 INTEGER NOT NULL DEFAULT 0, state_hash_wide_ch TEXT NOT NULL DEFAULT '',
   original_bool INTEGER NOT NULL DEFAULT 0);
-CREATE TABLE image_states (
+CREATE TABLE IF NOT EXISTS image_states (
   image_id INTEGER NOT NULL REFERENCES images(_id_int_64) ON DELETE CASCADE,
   state_id INTEGER NOT NULL REFERENCES image_history_states(_id_int_64) ON DELETE CASCADE,
   position INTEGER NOT NULL, is_current INTEGER NOT NULL DEFAULT 0,
   PRIMARY KEY (image_id, state_id)) WITHOUT ROWID;
-CREATE TABLE history_resources (
+CREATE TABLE IF NOT EXISTS history_resources (
   _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
   name_wide_ch TEXT NOT NULL DEFAULT '');
-CREATE TABLE state_resources (
+CREATE TABLE IF NOT EXISTS state_resources (
   state_id INTEGER NOT NULL REFERENCES image_history_states(_id_int_64) ON DELETE CASCADE,
   resource_id INTEGER NOT NULL REFERENCES history_resources(_id_int_64) ON DELETE CASCADE,
   PRIMARY KEY (state_id, resource_id)) WITHOUT ROWID;
-CREATE TABLE filters (
+CREATE TABLE IF NOT EXISTS filters (
   _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
   name_wide_ch TEXT NOT NULL DEFAULT '', order_float REAL NOT NULL DEFAULT 0,
   parent_id INTEGER REFERENCES filters(_id_int_64) ON DELETE CASCADE);
-CREATE TABLE filter_attributes (
+CREATE TABLE IF NOT EXISTS filter_attributes (
   _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
   filter_id_int_64 INTEGER NOT NULL UNIQUE REFERENCES filters(_id_int_64) ON DELETE CASCADE,
   favorite_bool INTEGER NOT NULL DEFAULT 0, selected_filter_types_wide_ch TEXT NOT NULL DEFAULT '');
-CREATE TABLE filter_images (
+CREATE TABLE IF NOT EXISTS filter_images (
   filter_id INTEGER NOT NULL REFERENCES filters(_id_int_64) ON DELETE CASCADE,
   image_id INTEGER NOT NULL REFERENCES images(_id_int_64) ON DELETE CASCADE,
   PRIMARY KEY (filter_id, image_id)) WITHOUT ROWID;
-CREATE TABLE smart_filters (
+CREATE TABLE IF NOT EXISTS smart_filters (
   _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
   identifier_wide_ch TEXT NOT NULL DEFAULT '', filter_conditions_wide_ch TEXT NOT NULL DEFAULT '',
   applying_conditions_wide_ch TEXT NOT NULL DEFAULT '', name_wide_ch TEXT NOT NULL DEFAULT '',
   parent_id INTEGER REFERENCES smart_filters(_id_int_64) ON DELETE CASCADE);
-CREATE TABLE smart_filter_attributes (
+CREATE TABLE IF NOT EXISTS smart_filter_attributes (
   _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
   smart_filter_id_int_64 INTEGER NOT NULL UNIQUE REFERENCES smart_filters(_id_int_64) ON DELETE CASCADE,
   selected_filter_types_wide_ch TEXT NOT NULL DEFAULT '');
-CREATE TABLE reffolders (
+CREATE TABLE IF NOT EXISTS reffolders (
   _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
   uuid_wide_ch TEXT NOT NULL DEFAULT '', path_id_int_64 INTEGER NOT NULL DEFAULT 0,
   order_float REAL NOT NULL DEFAULT 0,
   parent_id INTEGER REFERENCES reffolders(_id_int_64) ON DELETE CASCADE);
-CREATE TABLE referenced_folder_attributes (
+CREATE TABLE IF NOT EXISTS referenced_folder_attributes (
   _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
   ref_folder_id_int_64 INTEGER NOT NULL UNIQUE REFERENCES reffolders(_id_int_64) ON DELETE CASCADE,
   favorite_bool INTEGER NOT NULL DEFAULT 0, selected_filter_types_wide_ch TEXT NOT NULL DEFAULT '');
-CREATE TABLE referenced_folder_images (
+CREATE TABLE IF NOT EXISTS referenced_folder_images (
   ref_folder_id INTEGER NOT NULL REFERENCES reffolders(_id_int_64) ON DELETE CASCADE,
   image_id INTEGER NOT NULL REFERENCES images(_id_int_64) ON DELETE CASCADE,
   PRIMARY KEY (ref_folder_id, image_id)) WITHOUT ROWID;
-CREATE TABLE entity_favorite_aliases (
+CREATE TABLE IF NOT EXISTS entity_favorite_aliases (
   _id_int_64 INTEGER PRIMARY KEY, marked_to_delete_bool INTEGER NOT NULL DEFAULT 0,
   favorite_bool INTEGER NOT NULL DEFAULT 0, favorite_order_float REAL NOT NULL DEFAULT 0,
   orig_entity_type INTEGER NOT NULL DEFAULT 0, orig_entity_id_int_64 INTEGER NOT NULL DEFAULT 0,
@@ -112,64 +114,93 @@ CREATE TABLE entity_favorite_aliases (
 
 // Version 120: indexes on every link column and on every column that conditions filter on.
 constexpr const char* kCreateIndexes = R"sql(
-CREATE INDEX images_folder ON images(folder_path_id);
-CREATE INDEX paths_volume ON paths(volume_id_int_64, path_wide_ch);
-CREATE INDEX image_states_state ON image_states(state_id);
-CREATE INDEX state_resources_resource ON state_resources(resource_id);
-CREATE INDEX filters_parent ON filters(parent_id);
-CREATE INDEX filter_images_image ON filter_images(image_id);
-CREATE INDEX smart_filters_parent ON smart_filters(parent_id);
-CREATE INDEX reffolders_parent ON reffolders(parent_id);
-CREATE INDEX reffolders_path ON reffolders(path_id_int_64);
-CREATE INDEX referenced_folder_images_image ON referenced_folder_images(image_id);
-CREATE INDEX images_marked_to_delete_bool ON images(marked_to_delete_bool);
-CREATE INDEX images_guid_wide_ch ON images(guid_wide_ch);
-CREATE INDEX images_path_wide_ch ON images(path_wide_ch);
-CREATE INDEX images_file_size_int_64 ON images(file_size_int_64);
-CREATE INDEX images_modification_date_int_64 ON images(modification_date_int_64);
-CREATE INDEX images_import_date_int_64 ON images(import_date_int_64);
-CREATE INDEX images_import_index ON images(import_index);
-CREATE INDEX user_attributes_marked_to_delete_bool ON image_user_attributes(marked_to_delete_bool);
-CREATE INDEX user_attributes_trash_bool ON image_user_attributes(trash_bool);
-CREATE INDEX user_attributes_rating ON image_user_attributes(rating);
-CREATE INDEX user_attributes_edit_date_int_64 ON image_user_attributes(edit_date_int_64);
-CREATE INDEX user_attributes_opened_bool ON image_user_attributes(opened_bool);
-CREATE INDEX user_attributes_origin_path_wide_ch ON image_user_attributes(origin_path_wide_ch);
-CREATE INDEX user_attributes_lost_bool ON image_user_attributes(lost_bool);
-CREATE INDEX exiv_attributes_marked_to_delete_bool ON image_exiv_attributes(marked_to_delete_bool);
-CREATE INDEX exiv_attributes_iso_speed ON image_exiv_attributes(iso_speed);
-CREATE INDEX exiv_attributes_shutter_speed ON image_exiv_attributes(shutter_speed);
-CREATE INDEX exiv_attributes_number ON image_exiv_attributes(number);
-CREATE INDEX exiv_attributes_focal_len ON image_exiv_attributes(focal_len);
-CREATE INDEX exiv_attributes_focal_len35mm ON image_exiv_attributes(focal_len35mm);
-CREATE INDEX exiv_attributes_focal_len_min ON image_exiv_attributes(focal_len_min);
-CREATE INDEX exiv_attributes_focal_len_max ON image_exiv_attributes(focal_len_max);
-CREATE INDEX exiv_attributes_shutter_min ON image_exiv_attributes(shutter_min);
-CREATE INDEX exiv_attributes_shutter_max ON image_exiv_attributes(shutter_max);
-CREATE INDEX exiv_attributes_focus_distance ON image_exiv_attributes(focus_distance);
-CREATE INDEX exiv_attributes_bits_per_sample ON image_exiv_attributes(bits_per_sample);
-CREATE INDEX exiv_attributes_white_balance ON image_exiv_attributes(white_balance);
-CREATE INDEX exiv_attributes_white_balance_index ON image_exiv_attributes(white_balance_index);
-CREATE INDEX exiv_attributes_light_source ON image_exiv_attributes(light_source);
-CREATE INDEX exiv_attributes_metering_mode ON image_exiv_attributes(metering_mode);
-CREATE INDEX exiv_attributes_camera_maker_wide_ch ON image_exiv_attributes(camera_maker_wide_ch);
-CREATE INDEX exiv_attributes_camera_name_wide_ch ON image_exiv_attributes(camera_name_wide_ch);
-CREATE INDEX exiv_attributes_camera_model_wide_ch ON image_exiv_attributes(camera_model_wide_ch);
-CREATE INDEX exiv_attributes_lens_maker_wide_ch ON image_exiv_attributes(lens_maker_wide_ch);
-CREATE INDEX exiv_attributes_lens_pretty_name_wide_ch ON image_exiv_attributes(lens_pretty_name_wide_ch);
-CREATE INDEX exiv_attributes_date_time_int_64 ON image_exiv_attributes(date_time_int_64);
-CREATE INDEX exiv_attributes_is_raw_bool ON image_exiv_attributes(is_raw_bool);
-CREATE INDEX exiv_attributes_is_full_filled_bool ON image_exiv_attributes(is_full_filled_bool);
+CREATE INDEX IF NOT EXISTS images_folder ON images(folder_path_id);
+CREATE INDEX IF NOT EXISTS paths_volume ON paths(volume_id_int_64, path_wide_ch);
+CREATE INDEX IF NOT EXISTS image_states_state ON image_states(state_id);
+CREATE INDEX IF NOT EXISTS state_resources_resource ON state_resources(resource_id);
+CREATE INDEX IF NOT EXISTS filters_parent ON filters(parent_id);
+CREATE INDEX IF NOT EXISTS filter_images_image ON filter_images(image_id);
+CREATE INDEX IF NOT EXISTS smart_filters_parent ON smart_filters(parent_id);
+CREATE INDEX IF NOT EXISTS reffolders_parent ON reffolders(parent_id);
+CREATE INDEX IF NOT EXISTS reffolders_path ON reffolders(path_id_int_64);
+CREATE INDEX IF NOT EXISTS referenced_folder_images_image ON referenced_folder_images(image_id);
+CREATE INDEX IF NOT EXISTS images_marked_to_delete_bool ON images(marked_to_delete_bool);
+CREATE INDEX IF NOT EXISTS images_guid_wide_ch ON images(guid_wide_ch);
+CREATE INDEX IF NOT EXISTS images_path_wide_ch ON images(path_wide_ch);
+CREATE INDEX IF NOT EXISTS images_file_size_int_64 ON images(file_size_int_64);
+CREATE INDEX IF NOT EXISTS images_modification_date_int_64 ON images(modification_date_int_64);
+CREATE INDEX IF NOT EXISTS images_import_date_int_64 ON images(import_date_int_64);
+CREATE INDEX IF NOT EXISTS images_import_index ON images(import_index);
+CREATE INDEX IF NOT EXISTS user_attributes_marked_to_delete_bool ON image_user_attributes(marked_to_delete_bool);
+CREATE INDEX IF NOT EXISTS user_attributes_trash_bool ON image_user_attributes(trash_bool);
+CREATE INDEX IF NOT EXISTS user_attributes_rating ON image_user_attributes(rating);
+CREATE INDEX IF NOT EXISTS user_attributes_edit_date_int_64 ON image_user_attributes(edit_date_int_64);
+CREATE INDEX IF NOT EXISTS user_attributes_opened_bool ON image_user_attributes(opened_bool);
+CREATE INDEX IF NOT EXISTS user_attributes_origin_path_wide_ch ON image_user_attributes(origin_path_wide_ch);
+CREATE INDEX IF NOT EXISTS user_attributes_lost_bool ON image_user_attributes(lost_bool);
+CREATE INDEX IF NOT EXISTS exiv_attributes_marked_to_delete_bool ON image_exiv_attributes(marked_to_delete_bool);
+CREATE INDEX IF NOT EXISTS exiv_attributes_iso_speed ON image_exiv_attributes(iso_speed);
+CREATE INDEX IF NOT EXISTS exiv_attributes_shutter_speed ON image_exiv_attributes(shutter_speed);
+CREATE INDEX IF NOT EXISTS exiv_attributes_number ON image_exiv_attributes(number);
+CREATE INDEX IF NOT EXISTS exiv_attributes_focal_len ON image_exiv_attributes(focal_len);
+CREATE INDEX IF NOT EXISTS exiv_attributes_focal_len35mm ON image_exiv_attributes(focal_len35mm);
+CREATE INDEX IF NOT EXISTS exiv_attributes_focal_len_min ON image_exiv_attributes(focal_len_min);
+CREATE INDEX IF NOT EXISTS exiv_attributes_focal_len_max ON image_exiv_attributes(focal_len_max);
+CREATE INDEX IF NOT EXISTS exiv_attributes_shutter_min ON image_exiv_attributes(shutter_min);
+CREATE INDEX IF NOT EXISTS exiv_attributes_shutter_max ON image_exiv_attributes(shutter_max);
+CREATE INDEX IF NOT EXISTS exiv_attributes_focus_distance ON image_exiv_attributes(focus_distance);
+CREATE INDEX IF NOT EXISTS exiv_attributes_bits_per_sample ON image_exiv_attributes(bits_per_sample);
+CREATE INDEX IF NOT EXISTS exiv_attributes_white_balance ON image_exiv_attributes(white_balance);
+CREATE INDEX IF NOT EXISTS exiv_attributes_white_balance_index ON image_exiv_attributes(white_balance_index);
+CREATE INDEX IF NOT EXISTS exiv_attributes_light_source ON image_exiv_attributes(light_source);
+CREATE INDEX IF NOT EXISTS exiv_attributes_metering_mode ON image_exiv_attributes(metering_mode);
+CREATE INDEX IF NOT EXISTS exiv_attributes_camera_maker_wide_ch ON image_exiv_attributes(camera_maker_wide_ch);
+CREATE INDEX IF NOT EXISTS exiv_attributes_camera_name_wide_ch ON image_exiv_attributes(camera_name_wide_ch);
+CREATE INDEX IF NOT EXISTS exiv_attributes_camera_model_wide_ch ON image_exiv_attributes(camera_model_wide_ch);
+CREATE INDEX IF NOT EXISTS exiv_attributes_lens_maker_wide_ch ON image_exiv_attributes(lens_maker_wide_ch);
+CREATE INDEX IF NOT EXISTS exiv_attributes_lens_pretty_name_wide_ch ON image_exiv_attributes(lens_pretty_name_wide_ch);
+CREATE INDEX IF NOT EXISTS exiv_attributes_date_time_int_64 ON image_exiv_attributes(date_time_int_64);
+CREATE INDEX IF NOT EXISTS exiv_attributes_is_raw_bool ON image_exiv_attributes(is_raw_bool);
+CREATE INDEX IF NOT EXISTS exiv_attributes_is_full_filled_bool ON image_exiv_attributes(is_full_filled_bool);
 )sql";
+
+// One change of a migration step (a table, an index, ...). A part whose change is already in the file
+// leaves the file as it is, so that a file half migrated by an earlier engine still migrates.
+using MigrationPart = std::function<void(DBConnection&)>;
 
 struct MigrationStep {
   int version;
-  const char* sql;
+  std::vector<MigrationPart> parts;
 };
 
+// One part per statement of the SQL text; statements end with ';' and hold no other ';'.
+std::vector<MigrationPart> statementParts(std::string_view sql) {
+  std::vector<MigrationPart> parts;
+  for (std::size_t start = 0, end = sql.find(';'); end != std::string_view::npos;
+       start = end + 1, end = sql.find(';', start)) {
+    parts.push_back([statement = std::string(sql.substr(start, end - start))](DBConnection& connection) {
+      connection.exec(statement);
+    });
+  }
+  return parts;
+}
+
 const std::vector<MigrationStep>& migrationSteps() {
-  static const std::vector<MigrationStep> steps{{119, kCreateTables}, {120, kCreateIndexes}};
+  static const std::vector<MigrationStep> steps{{119, statementParts(kCreateTables)},
+                                                {120, statementParts(kCreateIndexes)}};
   return steps;
+}
+
+const MigrationStep& stepOf(int version) {
+  for (const auto& step : migrationSteps()) {
+    if (step.version == version) return step;
+  }
+  throw DBException("No migration step makes version " + std::to_string(version));
+}
+
+void runParts(DBConnection& connection, const MigrationStep& step, std::size_t count) {
+  for (std::size_t index = 0; index < count && index < step.parts.size(); ++index)
+    step.parts[index](connection);
 }
 
 // Whether SQL compiles against the file's current schema (a fresh statement, never a cached one).
@@ -204,9 +235,24 @@ int32_t DBSchema::applicationIdFor(int32_t appInfo) {
   return static_cast<int32_t>(0x4B524354u ^ static_cast<uint32_t>(appInfo));
 }
 
+const std::vector<int>& DBSchema::stepVersions() {
+  static const std::vector<int> versions = [] {
+    std::vector<int> all;
+    for (const auto& step : migrationSteps()) all.push_back(step.version);
+    return all;
+  }();
+  return versions;
+}
+
+std::size_t DBSchema::stepPartCount(int version) { return stepOf(version).parts.size(); }
+
+void DBSchema::runStepParts(DBConnection& connection, int version, std::size_t count) {
+  runParts(connection, stepOf(version), count);
+}
+
 void DBSchema::migrate(DBConnection& connection, int fromVersion) {
   for (const auto& step : migrationSteps()) {
-    if (step.version > fromVersion) connection.exec(step.sql);
+    if (step.version > fromVersion) runParts(connection, step, step.parts.size());
   }
   connection.exec("PRAGMA user_version = " + std::to_string(kCurrentVersion));
 }

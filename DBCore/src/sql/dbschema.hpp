@@ -1,6 +1,8 @@
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
+#include <vector>
 
 namespace dbcore {
 
@@ -15,6 +17,15 @@ class DBSchema {
 
   // SQLite application_id of a catalog written for the given application identity.
   static int32_t applicationIdFor(int32_t appInfo);
+
+  // The versions the migration steps make, oldest first; the last is kCurrentVersion.
+  static const std::vector<int>& stepVersions();
+  // Each step is a list of parts (one table, one index, ...); a part whose change is already in the file
+  // leaves it as it is. Throws DBException for a version no step makes.
+  static std::size_t stepPartCount(int version);
+  // Runs the first `count` parts of the step that makes the version and leaves the file's version alone:
+  // the shape of a file that holds some of a step's objects without its version.
+  static void runStepParts(DBConnection& connection, int version, std::size_t count);
 
   // Runs every migration step above the file's version, then sets the version; inside the caller's
   // transaction. A new file starts at version 0.

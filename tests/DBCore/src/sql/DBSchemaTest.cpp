@@ -2,12 +2,17 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <cstddef>
 #include <map>
+#include <memory>
 #include <set>
 #include <string>
 #include <tuple>
+#include <vector>
 
 #include "DBConnectionTestSupport.hpp"
+#include "dbexception.hpp"
 #include "dbrecords.hpp"
 
 using namespace dbcore;
@@ -66,6 +71,55 @@ class DBSchemaTest : public DBCatalogTestBase {
   void expectRecordTable() {
     SCOPED_TRACE(Record::kTableName);
     EXPECT_EQ(tableColumns(Record::kTableName), expectedColumns<Record>());
+  }
+
+  // The schema of a file, one text per table, column, index, index column and foreign key, with every
+  // property SQLite reports for it.
+  std::set<std::string> schemaOf(DBConnection& db) {
+    static const char* const kQueries[] = {
+        "SELECT 'table ' || name || ' wr=' || wr || ' strict=' || strict FROM pragma_table_list "
+        "WHERE schema = 'main'",
+        "SELECT type || ' ' || name || ' on ' || tbl_name FROM sqlite_schema",
+        "SELECT 'column ' || m.name || '.' || c.name || ' ' || c.type || ' notnull=' || c.\"notnull\" || "
+        "' default=' || ifnull(c.dflt_value, 'none') || ' pk=' || c.pk "
+        "FROM sqlite_schema AS m, pragma_table_info(m.name) AS c WHERE m.type = 'table'",
+        "SELECT 'index ' || m.name || ' ' || l.name || ' unique=' || l.\"unique\" || ' origin=' || l.origin "
+        "|| "
+        "' partial=' || l.partial FROM sqlite_schema AS m, pragma_index_list(m.name) AS l "
+        "WHERE m.type = 'table'",
+        "SELECT 'index column ' || m.name || ' ' || i.seqno || ' ' || ifnull(i.name, 'expression') "
+        "FROM sqlite_schema AS m, pragma_index_info(m.name) AS i WHERE m.type = 'index'",
+        "SELECT 'foreign key ' || m.name || ' ' || f.id || ' ' || f.seq || ' ' || f.\"table\" || ' ' || "
+        "f.\"from\" || ' ' || ifnull(f.\"to\", 'key') || ' ' || f.on_delete "
+        "FROM sqlite_schema AS m, pragma_foreign_key_list(m.name) AS f WHERE m.type = 'table'"};
+    std::set<std::string> schema;
+    for (const char* sql : kQueries) schema.merge(queryNames(db, sql));
+    return schema;
+  }
+
+  // A file as an earlier engine left it: every step below `version` done, the first `parts` parts of
+  // its own step done, and the version of the step before.
+  static std::unique_ptr<DBConnection> earlierShape(int version, std::size_t parts) {
+    auto file = std::make_unique<DBConnection>(":memory:");
+    file->transaction([&file, version, parts] {
+      int previous = 0;
+      for (int step : DBSchema::stepVersions()) {
+        if (step == version) break;
+        DBSchema::runStepParts(*file, step, DBSchema::stepPartCount(step));
+        previous = step;
+      }
+      DBSchema::runStepParts(*file, version, parts);
+      file->exec("PRAGMA user_version = " + std::to_string(previous));
+    });
+    return file;
+  }
+
+  // Migrates the file from its own version and checks that it then has the schema of a new catalog.
+  void expectMigratesToTheCurrentSchema(DBConnection& file) {
+    const int64_t version = file.queryInt64("PRAGMA user_version");
+    file.transaction([&file, version] { DBSchema::migrate(file, static_cast<int>(version)); });
+    EXPECT_EQ(file.queryInt64("PRAGMA user_version"), DBSchema::kCurrentVersion);
+    EXPECT_EQ(schemaOf(file), schemaOf(*connection));
   }
 
   bool wellFormedAfter(const std::string& sql) {
@@ -138,4 +192,39 @@ TEST_F(DBSchemaTest, RecordTablesHaveExactlyTheRecordAndLinkColumns) {
                  "SELECT m.name FROM sqlite_schema AS m, pragma_table_info(m.name) AS c "
                  "WHERE m.type = 'table' AND c.name = '_id_int_64'");
   EXPECT_EQ(tablesWithIds, recordTables);
+}
+
+TEST_F(DBSchemaTest, StepsRunFromTheOldestToTheCurrentVersion) {
+  const std::vector<int>& versions = DBSchema::stepVersions();
+  ASSERT_FALSE(versions.empty());
+  EXPECT_EQ(versions.front(), DBSchema::kOldestVersion);
+  EXPECT_EQ(versions.back(), DBSchema::kCurrentVersion);
+  EXPECT_TRUE(std::is_sorted(versions.begin(), versions.end()));
+  EXPECT_THROW(DBSchema::stepPartCount(DBSchema::kCurrentVersion + 1), DBException);
+}
+
+TEST_F(DBSchemaTest, EveryEarlierShapeMigratesToTheSchemaOfANewCatalog) {
+  for (int version : DBSchema::stepVersions()) {
+    for (std::size_t parts = 0; parts <= DBSchema::stepPartCount(version); ++parts) {
+      SCOPED_TRACE("step " + std::to_string(version) + " with " + std::to_string(parts) + " parts");
+      expectMigratesToTheCurrentSchema(*earlierShape(version, parts));
+      if (HasFailure()) return;
+    }
+  }
+}
+
+TEST_F(DBSchemaTest, OldestVersionThatHasAnIndexOfTheNextMigrates) {
+  for (const auto& index : indexNames(*connection)) {
+    if (index != "images_folder") connection->exec("DROP INDEX " + index);
+  }
+  connection->exec("PRAGMA user_version = " + std::to_string(DBSchema::kOldestVersion));
+  expectMigratesToTheCurrentSchema(*connection);
+}
+
+TEST_F(DBSchemaTest, RunningEveryStepAgainKeepsTheSchemaAndTheRecords) {
+  const std::set<std::string> schema = schemaOf(*connection);
+  connection->exec("INSERT INTO images(_id_int_64, guid_wide_ch) VALUES (7, 'kept')");
+  connection->transaction([this] { DBSchema::migrate(*connection, 0); });
+  EXPECT_EQ(schemaOf(*connection), schema);
+  EXPECT_EQ(queryIds("SELECT _id_int_64 FROM images WHERE guid_wide_ch = 'kept'"), (std::set<long long>{7}));
 }

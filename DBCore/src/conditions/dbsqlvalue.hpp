@@ -28,7 +28,7 @@ class DBSqlValue {
 
   DBSqlValue() = default;
   static DBSqlValue integer(int64_t value);
-  // A NaN becomes NULL, as sqlite3_bind_double makes it.
+  // A NaN becomes NULL: SQLite keeps no NaN, and the catalog stores a NaN float field as NULL.
   static DBSqlValue real(double value);
   static DBSqlValue text(std::string_view bytes);
 

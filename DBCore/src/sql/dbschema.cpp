@@ -185,9 +185,58 @@ std::vector<MigrationPart> statementParts(std::string_view sql) {
   return parts;
 }
 
+// Version 121: the float columns take NULL, which stands for NaN (SQLite keeps no NaN and stores it as
+// NULL). One part per table that has float columns.
+constexpr const char* kTablesWithFloats[] = {"image_exiv_attributes", "filters", "reffolders",
+                                             "entity_favorite_aliases"};
+
+const DBStaticSql kSchemaVersionSql("PRAGMA schema_version");
+
+// Runs the body with SQLite's table definitions writable; defensive mode, which forbids that, is off
+// only meanwhile.
+void withWritableSchema(DBConnection& connection, const std::function<void()>& body) {
+  sqlite3_db_config(connection.handle(), SQLITE_DBCONFIG_DEFENSIVE, 0, nullptr);
+  try {
+    connection.exec("PRAGMA writable_schema = ON");
+    body();
+  } catch (...) {
+    // The body's failure is the one to report: a failure to restore the flag here would hide it.
+    sqlite3_exec(connection.handle(), "PRAGMA writable_schema = RESET", nullptr, nullptr, nullptr);
+    sqlite3_db_config(connection.handle(), SQLITE_DBCONFIG_DEFENSIVE, 1, nullptr);
+    throw;
+  }
+  connection.exec("PRAGMA writable_schema = RESET");
+  sqlite3_db_config(connection.handle(), SQLITE_DBCONFIG_DEFENSIVE, 1, nullptr);
+}
+
+// SQLite cannot drop a NOT NULL constraint with ALTER TABLE, and rebuilding a table that others
+// reference would delete their rows through the foreign keys, which stay on inside the migration's
+// transaction. Dropping a constraint leaves every stored row valid, so the table's definition is
+// rewritten in place, as SQLite documents for such changes, and a new schema version makes every
+// connection read it again. A table whose floats already take NULL is left as it is.
+void allowNullFloats(DBConnection& connection, const std::string& table) {
+  withWritableSchema(connection, [&connection, &table] {
+    connection.exec(
+        "UPDATE sqlite_schema SET sql = replace(sql, ' REAL NOT NULL DEFAULT 0', ' REAL DEFAULT 0') "
+        "WHERE type = 'table' AND name = '" +
+        table + "' AND instr(sql, ' REAL NOT NULL DEFAULT 0') > 0");
+    if (connection.changes() == 0) return;
+    connection.exec("PRAGMA schema_version = " +
+                    std::to_string(connection.queryInt64(kSchemaVersionSql) + 1));
+  });
+}
+
+std::vector<MigrationPart> floatParts() {
+  std::vector<MigrationPart> parts;
+  for (const char* table : kTablesWithFloats) {
+    parts.push_back([table](DBConnection& connection) { allowNullFloats(connection, table); });
+  }
+  return parts;
+}
+
 const std::vector<MigrationStep>& migrationSteps() {
-  static const std::vector<MigrationStep> steps{{119, statementParts(kCreateTables)},
-                                                {120, statementParts(kCreateIndexes)}};
+  static const std::vector<MigrationStep> steps{
+      {119, statementParts(kCreateTables)}, {120, statementParts(kCreateIndexes)}, {121, floatParts()}};
   return steps;
 }
 

@@ -13,7 +13,7 @@ class DBSchema {
  public:
   // user_version of the oldest file this engine can migrate and of the files it writes.
   static constexpr int kOldestVersion = 119;
-  static constexpr int kCurrentVersion = 120;
+  static constexpr int kCurrentVersion = 121;
 
   // SQLite application_id of a catalog written for the given application identity.
   static int32_t applicationIdFor(int32_t appInfo);

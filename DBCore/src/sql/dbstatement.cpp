@@ -1,5 +1,8 @@
 #include "dbstatement.hpp"
 
+#include <cmath>
+#include <limits>
+
 #include "KRFoundation/KRUTF.hpp"
 #include "dbexception.hpp"
 #include "dbstrings.hpp"
@@ -53,11 +56,8 @@ DBStatement& DBStatement::bind(int index, const TVariant& value) {
   switch (value.type()) {
     case FieldType::T_NONE:
       return bindNull(index);
-    case FieldType::T_FLOAT: {
-      const int code = sqlite3_bind_double(statement_, index, value.asDouble());
-      if (code != SQLITE_OK) fail(code);
-      return *this;
-    }
+    case FieldType::T_FLOAT:
+      return bindDouble(index, value.asDouble());
     case FieldType::T_TEXT:
       return bind(index, value.asText());
     case FieldType::T_WIDE_TEXT:
@@ -68,6 +68,7 @@ DBStatement& DBStatement::bind(int index, const TVariant& value) {
 }
 
 DBStatement& DBStatement::bindDouble(int index, double value) {
+  if (std::isnan(value)) return bindNull(index);
   const int code = sqlite3_bind_double(statement_, index, value);
   if (code != SQLITE_OK) fail(code);
   return *this;
@@ -116,7 +117,8 @@ TVariant DBStatement::column(int column, FieldType type) const {
     case FieldType::T_INT_64:
       return TVariant(columnInt64(column));
     case FieldType::T_FLOAT:
-      return TVariant(static_cast<float>(columnDouble(column)));
+      return TVariant(columnIsNull(column) ? std::numeric_limits<float>::quiet_NaN()
+                                           : static_cast<float>(columnDouble(column)));
     case FieldType::T_TEXT:
       return TVariant(columnText(column));
     case FieldType::T_WIDE_TEXT:

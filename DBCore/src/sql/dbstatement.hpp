@@ -28,6 +28,7 @@ class DBStatement {
   DBStatement& bind(int index, int64_t value);
   DBStatement& bind(int index, const std::string& text);
   DBStatement& bind(int index, const TVariant& value);
+  // SQLite keeps no NaN: a NaN binds NULL, as sqlite3_bind_double would make it. Infinities bind as they are.
   DBStatement& bindDouble(int index, double value);
   // Binds wide text as UTF-8, converted through a buffer the statement keeps.
   DBStatement& bindWide(int index, const std::wstring& text);
@@ -42,7 +43,8 @@ class DBStatement {
   double columnDouble(int column) const;
   std::string columnText(int column) const;
   bool columnIsNull(int column) const;
-  // The column read as a value of the given field type.
+  // The column read as a value of the given field type. A float column's NULL reads as NaN, the value it
+  // stands for.
   TVariant column(int column, FieldType type) const;
 
  private:

@@ -23,6 +23,15 @@ TEST(DBSqlRowTest, VariantsBecomeStoredValues) {
   EXPECT_TRUE(row[7].isNull());
 }
 
+TEST(DBSqlRowTest, InfinitiesStayRealsAndEveryNaNIsNull) {
+  const DBSqlRow row(
+      std::vector<TVariant>{TVariant(INFINITY), TVariant(-INFINITY), TVariant(-std::nanf(""))});
+  EXPECT_EQ(row[0].storageClass(), DBSqlValue::Class::Real);
+  EXPECT_EQ(row[0].asReal(), HUGE_VAL);
+  EXPECT_EQ(row[1].asReal(), -HUGE_VAL);
+  EXPECT_TRUE(row[2].isNull());
+}
+
 TEST(DBSqlRowTest, PastTheEndIsNull) {
   const DBSqlRow row(std::vector<TVariant>{TVariant(int32_t{1})});
   EXPECT_TRUE(row[1].isNull());

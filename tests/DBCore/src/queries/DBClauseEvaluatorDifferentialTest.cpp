@@ -41,6 +41,12 @@ const std::vector<int64_t> kInt64s = {
 const std::vector<float> kFloats = {0.0f,   -0.0f,       0.1f,        1.5f,     3.0f,
                                     -2.5f,  FLT_MAX,     -FLT_MAX,    FLT_MIN,  1e-45f,
                                     100.0f, 16777216.0f, 16777217.0f, INFINITY, -INFINITY};
+// Stored floats also take NaN, which the file keeps as NULL.
+const std::vector<float> kRecordFloats = [] {
+  std::vector<float> values = kFloats;
+  values.push_back(NAN);
+  return values;
+}();
 const std::vector<std::wstring> kWideTexts = {L"",    L"a",    L"IMG_1.CR3", L"12",           L" 12", L"1e3",
                                               L"-0",  L"0x10", L"\u00e9",    L"\u65e5\u672c", L"a'b", L"Z",
                                               L"abc", L"3",    L"2.5",       L"true"};
@@ -118,10 +124,10 @@ class Catalog {
   void addExifAttributes(std::mt19937_64& random, const DBImage& image) {
     auto attributes = std::make_shared<DBExivImgAttrib>();
     attributes->image_id = image.id();
-    attributes->iso_speed = pick(random, kFloats);
-    attributes->shutter_speed = pick(random, kFloats);
-    attributes->f_number = pick(random, kFloats);
-    attributes->focal_length = pick(random, kFloats);
+    attributes->iso_speed = pick(random, kRecordFloats);
+    attributes->shutter_speed = pick(random, kRecordFloats);
+    attributes->f_number = pick(random, kRecordFloats);
+    attributes->focal_length = pick(random, kRecordFloats);
     attributes->bps = pick(random, kInts);
     attributes->white_balance = pick(random, kInts);
     attributes->camera_maker = pick(random, kWideTexts);
@@ -283,7 +289,8 @@ class TextMaker {
     static const std::vector<std::string> numbers = {
         "0", "1", "-1", "3", "2.5", "16777217", "0.1", "-0", "9223372036854775807", "100000000000000000000",
         "5"};
-    static const std::vector<std::string> words = {"true", "false", "abc", "Z", "camera", "rating"};
+    static const std::vector<std::string> words = {"true",   "false", "abc",      "Z",  "camera",
+                                                   "rating", "nan",   "infinity", "inf"};
     static const std::vector<std::string> quoted = {
         "'x'", "'IMG_1.CR3'", "''", "'12'", "' 12'", "'1e3'", "'a\\'b'", "\"abc\"", "'3'", "'2.5'", "'true'"};
     std::mt19937_64& random = generator_.value();

@@ -4,8 +4,10 @@
 
 #include <functional>
 #include <string>
+#include <utility>
 #include <vector>
 
+#include "DBNonFiniteFloatTestSupport.hpp"
 #include "DBSelectQueryTestSupport.hpp"
 
 using namespace dbcore;
@@ -113,4 +115,45 @@ TEST_F(DBExivImgAttribSelectQueryTest, SelectsExifRecordsByTheirColumns) {
   query->Where(where<DBExivImgAttrib>("iso_speed == 0.1"));
   EXPECT_EQ(selectedIds<DBExivImgAttrib>(query), std::vector<long long>{b->id()});
   EXPECT_EQ(satisfyingIds(query, all), std::vector<long long>{b->id()});
+}
+
+// Cameras write 0/0 and x/0 rationals: one batch imports NaN and infinities in every float field. NaN is
+// a missing value to conditions, as SQL's NULL is: no comparison with it holds, not even with itself.
+TEST_F(DBExivImgAttribSelectQueryTest, NaNAndInfinitiesImportReadBackAndSelectAlikeInSqlAndInMemory) {
+  std::vector<float> values = nonfinite::kValues;
+  values.push_back(2.0f);
+  std::vector<std::shared_ptr<DBExivImgAttrib>> records;
+  for (float value : values) {
+    auto record = std::make_shared<DBExivImgAttrib>();
+    record->image_id = makeImage(L"image " + std::to_wstring(records.size()))->id();
+    nonfinite::setEveryFloat(*record, value);
+    records.push_back(record);
+  }
+  *reactor << records;
+  for (size_t index = 0; index < records.size(); ++index) {
+    const auto read = reactor->Get<DBExivImgAttrib>(records[index]->id());
+    ASSERT_TRUE(read);
+    EXPECT_TRUE(nonfinite::everyFloatIs(*read, values[index]));
+  }
+  // Indexes into `values`: NaN, +inf, -inf, 2.
+  const std::vector<std::pair<std::string, std::vector<size_t>>> conditions = {
+      {"ev > 1", {1, 3}},
+      {"ev <= 1", {2}},
+      {"ev == ev", {1, 2, 3}},
+      {"ev != 2", {1, 2}},
+      {"ev == inf", {1}},
+      {"ev == nan || ev != nan", {}},
+      {"ev == max_from_column(ev)", {1}},
+      {"ev == min_from_column(ev)", {2}},
+      {"aperture != focal_len || ev == 2", {3}},
+      {"ev > 1 || 1", {0, 1, 2, 3}},
+  };
+  for (const auto& [condition, indexes] : conditions) {
+    std::vector<long long> expected;
+    for (size_t index : indexes) expected.push_back(records[index]->id());
+    auto query = std::make_shared<DBExivImgAttribSelectQuery>();
+    query->Where(where<DBExivImgAttrib>(condition));
+    EXPECT_EQ(selectedIds<DBExivImgAttrib>(query), expected) << condition;
+    EXPECT_EQ(satisfyingIds(query, records), expected) << condition;
+  }
 }

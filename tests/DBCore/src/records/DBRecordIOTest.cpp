@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "DBConnectionTestSupport.hpp"
+#include "DBNonFiniteFloatTestSupport.hpp"
 #include "dbrecords.hpp"
 
 using namespace dbcore;
@@ -23,6 +24,23 @@ class DBRecordIOTest : public DBCatalogTestBase {
   }
 
   int64_t pathCount() { return connection->queryInt64("SELECT count(*) FROM paths"); }
+
+  // Writes the record with every float field at NaN, the infinities and a number in turn (an insert,
+  // then updates), and checks what each write reads back.
+  template <class Record>
+  void expectNonFiniteFloatsSurvive(Record record) {
+    std::vector<float> values = nonfinite::kValues;
+    values.push_back(2.5f);
+    values.push_back(values.front());
+    for (float value : values) {
+      SCOPED_TRACE(std::string(Record::kTableName) + " " + std::to_string(value));
+      nonfinite::setEveryFloat(record, value);
+      DBRecordIO::write(*connection, record);
+      const auto read = DBRecordIO::get<Record>(*connection, record.id());
+      ASSERT_TRUE(read);
+      EXPECT_TRUE(nonfinite::everyFloatIs(*read, value));
+    }
+  }
 
   DBStatementLease pathsInIdOrder() {
     return connection->prepare(DBRecordIO::selectSql<DBPath>() + " ORDER BY _id_int_64");
@@ -78,6 +96,15 @@ TEST_F(DBRecordIOTest, EveryFieldSurvivesTheFile) {
   const auto read = DBRecordIO::get<DBImage>(*connection, image.id());
   ASSERT_TRUE(read);
   EXPECT_EQ(read->column_values(), image.column_values());
+}
+
+TEST_F(DBRecordIOTest, FloatFieldsKeepNaNAndInfinities) {
+  DBExivImgAttrib exif;
+  exif.image_id = saved(DBImage())->id();
+  expectNonFiniteFloatsSurvive(exif);
+  expectNonFiniteFloatsSurvive(DBFilter());
+  expectNonFiniteFloatsSurvive(DBRefFolder());
+  expectNonFiniteFloatsSurvive(DBEntityFavoriteAlias());
 }
 
 TEST_F(DBRecordIOTest, RemoveIsTrueOnlyForAStoredRow) {

@@ -19,6 +19,9 @@ using namespace dbcore;
 
 namespace {
 
+// The version whose step lets float columns take NULL.
+constexpr int kNullFloatsVersion = 121;
+
 class DBSchemaTest : public DBCatalogTestBase {
  protected:
   // The text of the first column of each row of a query (SQL of the test's own).
@@ -120,6 +123,35 @@ class DBSchemaTest : public DBCatalogTestBase {
     file.transaction([&file, version] { DBSchema::migrate(file, static_cast<int>(version)); });
     EXPECT_EQ(file.queryInt64("PRAGMA user_version"), DBSchema::kCurrentVersion);
     EXPECT_EQ(schemaOf(file), schemaOf(*connection));
+  }
+
+  // Float fields take NULL, which stands for NaN; every other field keeps NOT NULL.
+  template <class... Records>
+  void expectNullOnlyInFloats(std::tuple<Records...>*) {
+    (expectNullOnlyInFloats<Records>(), ...);
+  }
+
+  template <class Record>
+  void expectNullOnlyInFloats() {
+    const std::set<std::string> notNull =
+        queryNames(*connection, std::string("SELECT name FROM pragma_table_info('") + Record::kTableName +
+                                    "') WHERE \"notnull\"");
+    for (const auto& column : Record::all_columns()) {
+      if (std::string(column.name) == kIdColumn) continue;
+      EXPECT_EQ(notNull.count(column.name) == 0, column.type == FieldType::T_FLOAT)
+          << Record::kTableName << "." << column.name;
+    }
+  }
+
+  static int64_t notNullOfEv(DBConnection& file) {
+    return file.queryInt64(
+        std::string("SELECT \"notnull\" FROM pragma_table_info('image_exiv_attributes') WHERE name = 'ev'"));
+  }
+
+  static int defensiveMode(DBConnection& file) {
+    int enabled = -1;
+    sqlite3_db_config(file.handle(), SQLITE_DBCONFIG_DEFENSIVE, -1, &enabled);
+    return enabled;
   }
 
   bool wellFormedAfter(const std::string& sql) {
@@ -227,4 +259,54 @@ TEST_F(DBSchemaTest, RunningEveryStepAgainKeepsTheSchemaAndTheRecords) {
   connection->transaction([this] { DBSchema::migrate(*connection, 0); });
   EXPECT_EQ(schemaOf(*connection), schema);
   EXPECT_EQ(queryIds("SELECT _id_int_64 FROM images WHERE guid_wide_ch = 'kept'"), (std::set<long long>{7}));
+}
+
+TEST_F(DBSchemaTest, FloatColumnsAloneTakeNull) {
+  expectNullOnlyInFloats(static_cast<DBRecordTypes*>(nullptr));
+}
+
+TEST_F(DBSchemaTest, FloatStepKeepsEveryRowAndLinkOfTheTablesItChanges) {
+  const auto file = earlierShape(kNullFloatsVersion, 0);
+  file->exec(
+      "INSERT INTO images(_id_int_64) VALUES (1);"
+      "INSERT INTO image_exiv_attributes(image_id_int_64, ev) VALUES (1, 2.5);"
+      "INSERT INTO filters(_id_int_64, order_float) VALUES (1, 1.5);"
+      "INSERT INTO filters(_id_int_64, order_float, parent_id) VALUES (2, 0.5, 1);"
+      "INSERT INTO filter_images(filter_id, image_id) VALUES (2, 1);"
+      "INSERT INTO filter_attributes(filter_id_int_64) VALUES (2);"
+      "INSERT INTO reffolders(_id_int_64) VALUES (1);"
+      "INSERT INTO referenced_folder_images(ref_folder_id, image_id) VALUES (1, 1)");
+  ASSERT_EQ(notNullOfEv(*file), 1);
+  expectMigratesToTheCurrentSchema(*file);
+  EXPECT_EQ(file->queryInt64(std::string("SELECT count(*) FROM image_exiv_attributes WHERE ev = 2.5")), 1);
+  EXPECT_EQ(file->queryInt64(std::string("SELECT count(*) FROM filters WHERE parent_id = 1")), 1);
+  EXPECT_EQ(file->queryInt64(std::string("SELECT count(*) FROM filter_images")), 1);
+  EXPECT_EQ(file->queryInt64(std::string("SELECT count(*) FROM filter_attributes")), 1);
+  EXPECT_EQ(file->queryInt64(std::string("SELECT count(*) FROM referenced_folder_images")), 1);
+  file->exec("UPDATE filters SET order_float = NULL; UPDATE image_exiv_attributes SET ev = NULL");
+  EXPECT_EQ(file->queryInt64(std::string("SELECT count(*) FROM filters WHERE order_float IS NULL")), 2);
+  EXPECT_EQ(defensiveMode(*file), 1);
+}
+
+TEST_F(DBSchemaTest, FloatStepRolledBackKeepsTheConstraint) {
+  const auto file = earlierShape(kNullFloatsVersion, 0);
+  EXPECT_THROW(file->transaction([&file] {
+    DBSchema::migrate(*file, kNullFloatsVersion - 1);
+    ASSERT_EQ(notNullOfEv(*file), 0);
+    throw DBException("stopped");
+  }),
+               DBException);
+  EXPECT_EQ(notNullOfEv(*file), 1);
+  file->exec("INSERT INTO images(_id_int_64) VALUES (1)");
+  EXPECT_THROW(file->exec("INSERT INTO image_exiv_attributes(image_id_int_64, ev) VALUES (1, NULL)"),
+               DBException);
+}
+
+TEST_F(DBSchemaTest, FloatStepThatFailsLeavesDefensiveModeOn) {
+  const auto file = earlierShape(kNullFloatsVersion, 0);
+  file->exec("PRAGMA query_only = ON");
+  EXPECT_THROW(DBSchema::migrate(*file, kNullFloatsVersion - 1), DBException);
+  EXPECT_EQ(defensiveMode(*file), 1);
+  file->exec("PRAGMA query_only = OFF");
+  EXPECT_EQ(notNullOfEv(*file), 1);
 }

@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 #include <sqlite3.h>
 
+#include <cmath>
 #include <cstdint>
 #include <limits>
 #include <string>
@@ -147,4 +148,29 @@ TEST_F(DBStatementTest, BindOutsideTheParametersThrowsRangeError) {
   DBStatement statement(db, "SELECT ?");
   EXPECT_EQ(failureOf([&statement] { statement.bind(2, int64_t{1}); }).code(), SQLITE_RANGE);
   EXPECT_EQ(failureOf([&statement] { statement.bind(0, std::string("x")); }).code(), SQLITE_RANGE);
+}
+
+TEST_F(DBStatementTest, NaNBindsNullAndInfinitiesBindAsReals) {
+  DBStatement statement(db, "SELECT typeof(?), typeof(?), ?, ?, typeof(?)");
+  const double infinity = std::numeric_limits<double>::infinity();
+  statement.bindDouble(1, std::nan(""))
+      .bindDouble(2, infinity)
+      .bindDouble(3, infinity)
+      .bindDouble(4, -infinity);
+  statement.bind(5, TVariant(std::numeric_limits<float>::quiet_NaN()));
+  ASSERT_TRUE(statement.step());
+  EXPECT_EQ(statement.columnText(0), "null");
+  EXPECT_EQ(statement.columnText(1), "real");
+  EXPECT_EQ(statement.columnDouble(2), infinity);
+  EXPECT_EQ(statement.columnDouble(3), -infinity);
+  EXPECT_EQ(statement.columnText(4), "null");
+}
+
+TEST_F(DBStatementTest, FloatColumnReadsNullAsNaNAndKeepsInfinities) {
+  DBStatement statement(db, "SELECT NULL, 9e999, -9e999, NULL");
+  ASSERT_TRUE(statement.step());
+  EXPECT_TRUE(std::isnan(statement.column(0, FieldType::T_FLOAT).asFloat()));
+  EXPECT_EQ(statement.column(1, FieldType::T_FLOAT), TVariant(std::numeric_limits<float>::infinity()));
+  EXPECT_EQ(statement.column(2, FieldType::T_FLOAT), TVariant(-std::numeric_limits<float>::infinity()));
+  EXPECT_EQ(statement.column(3, FieldType::T_INT_64), TVariant(int64_t{0}));
 }

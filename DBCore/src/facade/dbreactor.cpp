@@ -26,7 +26,8 @@ namespace {
 const DBStaticSql kUserVersionSql("PRAGMA user_version");
 const DBStaticSql kProductVersionSql("SELECT value FROM catalog_info WHERE key = 'product_version'");
 
-// Copies the consistent content of an open database into a new file.
+// Copies the consistent content of an open database into a new file. The copy is a catalog of its own:
+// it gets a new identifier, so that the log of the original, left beside a restored copy, is refused.
 bool copyDatabase(sqlite3* source, const std::string& destination) {
   sqlite3* target = nullptr;
   bool copied = sqlite3_open_v2(destination.c_str(), &target, SQLITE_OPEN_READWRITE | SQLITE_OPEN_CREATE,
@@ -36,6 +37,7 @@ bool copyDatabase(sqlite3* source, const std::string& destination) {
     copied = backup && sqlite3_backup_step(backup, -1) == SQLITE_DONE;
     copied = sqlite3_backup_finish(backup) == SQLITE_OK && copied;
   }
+  copied = copied && DBCatalogIdentity::renew(target);
   return sqlite3_close_v2(target) == SQLITE_OK && copied;
 }
 

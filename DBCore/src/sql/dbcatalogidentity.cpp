@@ -38,6 +38,12 @@ bool DBCatalogIdentity::assignIfMissing(DBConnection& connection) {
   return true;
 }
 
+bool DBCatalogIdentity::renew(sqlite3* db) {
+  return sqlite3_exec(db,
+                      "UPDATE catalog_info SET value = lower(hex(randomblob(16))) WHERE key = 'catalog_id'",
+                      nullptr, nullptr, nullptr) == SQLITE_OK;
+}
+
 bool DBCatalogIdentity::sameCatalog(const DBCatalogIdentity& other) const {
   return readable_ && other.readable_ && applicationId_ == other.applicationId_ &&
          catalogId_ == other.catalogId_;

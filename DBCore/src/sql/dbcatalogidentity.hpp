@@ -1,5 +1,7 @@
 #pragma once
 
+#include <sqlite3.h>
+
 #include <cstdint>
 #include <string>
 
@@ -19,6 +21,9 @@ class DBCatalogIdentity {
   // Stores a new random identifier in a catalog that has none, in a transaction of its own; true when it
   // did. Throws DBException when it cannot write.
   static bool assignIfMissing(DBConnection& connection);
+  // Gives a catalog that has an identifier a new one (a copy becoming a catalog of its own); false when
+  // it cannot write.
+  static bool renew(sqlite3* db);
 
   bool readable() const { return readable_; }
   // A database without any schema object and without an application id: a file being created.

@@ -684,6 +684,22 @@ TEST_F(DBReactorTest, BackupReplacesAnExistingFileAndLeavesNoTemporaryFile) {
   EXPECT_EQ(files, 0);
 }
 
+TEST_F(DBReactorTest, BackupIsACatalogOfItsOwnThatTheOriginalsLogCannotReach) {
+  makeImage(L"a.jpg");
+  const std::string copy = directory.file("copy.krcatalog");
+  ASSERT_TRUE(reactor->Backup(s2ws(copy)));
+  EXPECT_EQ(catalogId(copy).size(), 32u);
+  EXPECT_NE(catalogId(copy), catalogId(catalogPath()));
+  // The original goes on writing; its log, left beside the copy restored in its place, is refused.
+  makeImage(L"b.jpg");
+  writeFileBytes(copy + "-wal", fileBytes(catalogPath() + "-wal"));
+  expectRefusedUnchanged(copy, {kDBOpenFailed});
+  std::filesystem::remove(copy + "-wal");
+  DBReactor restored(kAppInfo);
+  ASSERT_EQ(restored.Open(s2ws(copy), L""), kDBOpenCurrent);
+  EXPECT_EQ(restored.Count<DBImage>(), 1u);
+}
+
 TEST_F(DBReactorTest, BackupRemovesTheTemporariesOfGoneProcessesOnly) {
   const std::string copy = directory.file("copy.krcatalog");
   const pid_t gone = fork();

@@ -56,6 +56,16 @@ TEST_F(DBCatalogIdentityTest, TwoCatalogsDiffer) {
   EXPECT_TRUE(identityOf(first).sameCatalog(identityOf(first)));
 }
 
+TEST_F(DBCatalogIdentityTest, RenewGivesANewIdentifier) {
+  const std::string path = catalog("a.db");
+  DBConnection connection(path);
+  DBCatalogIdentity::assignIfMissing(connection);
+  const DBCatalogIdentity before = identityOf(path);
+  EXPECT_TRUE(DBCatalogIdentity::renew(connection.handle()));
+  EXPECT_FALSE(before.sameCatalog(identityOf(path)));
+  EXPECT_FALSE(DBCatalogIdentity::renew(DBConnection(":memory:").handle()));
+}
+
 TEST_F(DBCatalogIdentityTest, ApplicationIdIsPartOfTheIdentity) {
   const std::string path = catalog("a.db");
   const DBCatalogIdentity before = identityOf(path);

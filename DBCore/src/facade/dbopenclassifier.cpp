@@ -99,7 +99,8 @@ int DBOpenClassifier::classifyView(const DBReadOnlyDatabase& view) const {
   if (applicationId == 0 && version == 0 && objects == 0) return kDBOpenNeedsUpdate;
   if (applicationId != applicationId_) return kDBOpenIncompatible;
   if (version > DBSchema::kCurrentVersion || version < DBSchema::kOldestVersion) return kDBOpenIncompatible;
-  if (!(DBSchemaLayout::of(view.handle()) == DBSchemaLayout::expected())) return kDBOpenFailed;
+  if (!(DBSchemaLayout::of(view.handle()) == DBSchemaLayout::ofVersion(static_cast<int>(version))))
+    return kDBOpenFailed;
   return version < DBSchema::kCurrentVersion ? kDBOpenNeedsUpdate : kDBOpenCurrent;
 }
 

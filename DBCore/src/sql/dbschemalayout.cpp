@@ -37,9 +37,11 @@ DBSchemaLayout DBSchemaLayout::of(sqlite3* db) {
   return layout;
 }
 
-DBSchemaLayout DBSchemaLayout::expected() {
+DBSchemaLayout DBSchemaLayout::ofVersion(int version) {
   DBConnection memory(":memory:");
-  DBSchema::migrate(memory, 0);
+  for (const int step : DBSchema::stepVersions()) {
+    if (step <= version) DBSchema::runStepParts(memory, step, DBSchema::stepPartCount(step));
+  }
   return of(memory.handle());
 }
 

@@ -14,9 +14,10 @@ class DBSchemaLayout {
  public:
   // The layout of an open database; throws DBException when its schema cannot be read.
   static DBSchemaLayout of(sqlite3* db);
-  // The layout of a catalog the engine's migration steps build. Every version the engine migrates has
-  // the same tables, columns and keys: the steps after the first add indexes or relax constraints.
-  static DBSchemaLayout expected();
+  // The layout of a catalog of the given version: the migration steps up to it, run in memory. The
+  // versions the engine knows today share one layout: the steps after the first add indexes or drop
+  // NOT NULL, which a layout does not hold.
+  static DBSchemaLayout ofVersion(int version);
 
   bool operator==(const DBSchemaLayout& other) const = default;
 

@@ -19,13 +19,21 @@ DBSchemaLayout layoutAfter(const std::string& sql) {
 }  // namespace
 
 TEST(DBSchemaLayoutTest, ExpectedLayoutIsTheMigratedOne) {
-  EXPECT_TRUE(layoutAfter("SELECT 1") == DBSchemaLayout::expected());
+  EXPECT_TRUE(layoutAfter("SELECT 1") == DBSchemaLayout::ofVersion(DBSchema::kCurrentVersion));
+}
+
+TEST(DBSchemaLayoutTest, EveryVersionHasTheLayoutOfItsSteps) {
+  EXPECT_FALSE(DBSchemaLayout::ofVersion(0) == DBSchemaLayout::ofVersion(DBSchema::kOldestVersion));
+  for (const int version : DBSchema::stepVersions()) {
+    EXPECT_TRUE(DBSchemaLayout::ofVersion(version) == DBSchemaLayout::ofVersion(DBSchema::kCurrentVersion))
+        << version;
+  }
 }
 
 TEST(DBSchemaLayoutTest, IndexesAndRowsAreNotPartOfIt) {
   EXPECT_TRUE(
       layoutAfter("CREATE INDEX extra ON images(width); INSERT INTO volumes DEFAULT VALUES; ANALYZE") ==
-      DBSchemaLayout::expected());
+      DBSchemaLayout::ofVersion(DBSchema::kCurrentVersion));
 }
 
 TEST(DBSchemaLayoutTest, NamesTypesKeysAndTablesAreCompared) {
@@ -34,7 +42,7 @@ TEST(DBSchemaLayoutTest, NamesTypesKeysAndTablesAreCompared) {
                            "ALTER TABLE catalog_info RENAME TO info", "CREATE TABLE extra(x)",
                            "ALTER TABLE images ADD COLUMN other_folder INTEGER REFERENCES paths(_id_int_64)",
                            "ALTER TABLE volumes ADD COLUMN number REAL"}) {
-    EXPECT_FALSE(layoutAfter(edit) == DBSchemaLayout::expected()) << edit;
+    EXPECT_FALSE(layoutAfter(edit) == DBSchemaLayout::ofVersion(DBSchema::kCurrentVersion)) << edit;
   }
 }
 

@@ -10,7 +10,7 @@ namespace reliability {
 inline constexpr dbcore::AppInfo kAppInfo = 5;
 inline constexpr int32_t kApplicationIdBase = 0x4B524354;
 inline constexpr int32_t kApplicationId = kApplicationIdBase ^ kAppInfo;
-inline constexpr int kCurrentVersion = 120;
+inline constexpr int kCurrentVersion = 121;
 inline constexpr int kOldestVersion = 119;
 
 }  // namespace reliability

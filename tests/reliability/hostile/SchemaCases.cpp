@@ -58,11 +58,13 @@ void SchemaCases::addTableDrops(std::vector<HostileCase>& cases, const HostileSo
   }
 }
 
-// Version 119 has no indexes; migrating to 120 creates them.
+// The oldest version has no indexes; migrating creates them.
 void SchemaCases::addIndexEdits(std::vector<HostileCase>& cases, const HostileSources& sources) {
   const std::vector<std::string> indexes = sources.indexes();
   const std::vector<std::string> allButFirst(indexes.begin() + 1, indexes.end());
-  const auto oldest = [](RawDatabase& database) { database.exec("PRAGMA user_version = 119"); };
+  const auto oldest = [](RawDatabase& database) {
+    database.exec("PRAGMA user_version = " + std::to_string(kOldestVersion));
+  };
   cases.push_back(edited(
       sources, "extra index on a current catalog",
       [](RawDatabase& database) { database.exec("CREATE INDEX extra_height ON images(height)"); }, {0}));
@@ -82,7 +84,7 @@ void SchemaCases::addIndexEdits(std::vector<HostileCase>& cases, const HostileSo
 }
 
 void SchemaCases::addHeaderEdits(std::vector<HostileCase>& cases, const HostileSources& sources) {
-  for (const int version : {118, 121, 999, 0, -1}) {
+  for (const int version : {kOldestVersion - 1, kCurrentVersion + 1, 999, 0, -1}) {
     const std::string pragma = "PRAGMA user_version = " + std::to_string(version);
     cases.push_back(edited(sources, "user_version " + std::to_string(version),
                            [pragma](RawDatabase& database) { database.exec(pragma); }, {3}));

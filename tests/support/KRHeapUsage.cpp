@@ -9,7 +9,8 @@
 #endif
 
 #ifdef KR_SANITIZER_HEAP
-#include <sanitizer/allocator_interface.h>
+// The sanitizers' allocators count for themselves; their runtimes export this (GCC ships no header for it).
+extern "C" std::size_t __sanitizer_get_current_allocated_bytes();
 
 std::size_t KRHeapUsage::allocatedBytes() { return __sanitizer_get_current_allocated_bytes(); }
 #else

@@ -60,7 +60,9 @@ DBReadOnlyDatabase::DBReadOnlyDatabase(const std::string& path, View view) {
   sqlite3_db_config(db_, SQLITE_DBCONFIG_ENABLE_VIEW, 0, nullptr);
   // Closing never checkpoints: the log stays as it was found.
   sqlite3_db_config(db_, SQLITE_DBCONFIG_NO_CKPT_ON_CLOSE, 1, nullptr);
-  sqlite3_busy_timeout(db_, 5000);
+  // A reader of a log waits only while another connection rebuilds the log's index; an index that cannot
+  // be read at all (a damaged -shm) would otherwise hold every read for the whole timeout.
+  sqlite3_busy_timeout(db_, 1000);
 }
 
 DBReadOnlyDatabase::~DBReadOnlyDatabase() { sqlite3_close_v2(db_); }

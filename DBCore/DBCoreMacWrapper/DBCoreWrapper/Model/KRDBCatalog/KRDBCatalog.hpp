@@ -1,0 +1,146 @@
+#pragma once
+
+#include <atomic>
+#include <cstdint>
+#include <functional>
+#include <memory>
+#include <mutex>
+
+#include "KRClasses/KRAbstractModel.hpp"
+#include "KRClasses/KRBlockDispatcher.hpp"
+#include "KRFoundation/KRError.hpp"
+#include "Model/KRDBEntity/KRDBDataStorageCreating.hpp"
+
+namespace dbcore {
+class DBReactor;
+}
+
+// The gateway to one catalog file: opens it through the engine, keeps the product version stored in it,
+// and runs every engine operation on one serial queue (the dispatcher) inside an exception guard that
+// turns engine exceptions into platform exceptions.
+//
+// Operations come in pairs: one that takes a handler and a sync flag, and its worker whose name ends in
+// Sync. With sync true the caller waits and the handler runs on the queue before the caller resumes; with
+// sync false the operation is queued and its handler runs later on the main thread. Once new operations
+// are disallowed (closing), such calls return at once and never call their handler. Queued blocks hold
+// the catalog weakly. Thread-safe: any thread may queue operations.
+class KRDBCatalog : public KRAbstractModel {
+ public:
+  using Reactor = std::shared_ptr<dbcore::DBReactor>;
+  using ReactorBlock = std::function<void(const Reactor& reactor)>;
+  using Handler = std::function<void()>;
+
+  // The application identity given to the engine.
+  static int32_t applicationInfo() { return 5; }
+  static int32_t applicationID() { return applicationInfo(); }
+
+  // Opens the file (nil path: the empty path). Nil for a file that cannot be opened; for a file of an
+  // incompatible version, nil and *error (when given) set to kr_incompatibleAppVersion().
+  static std::shared_ptr<KRDBCatalog> initWithContentsOfFile(const KRString& path, KRErrorPtr* error);
+  ~KRDBCatalog() override;
+
+  // A copy of the engine's pointer, so that an operation keeps the engine alive while it runs; empty
+  // once the catalog closed.
+  Reactor dbReactor() const;
+  void setDbReactor(Reactor reactor);
+  const std::shared_ptr<KRBlockDispatcher>& dispatcher() const { return dispatcher_; }
+  bool needUpdate() const { return needUpdate_; }
+  void setNeedUpdate(bool needUpdate) { needUpdate_ = needUpdate; }
+  bool containsUserData() const { return containsUserData_; }
+  void setContainsUserData(bool containsUserData) { containsUserData_ = containsUserData; }
+  bool isNewOperationsDisallowed() const { return newOperationsDisallowed_; }
+  void setNewOperationsDisallowed(bool disallowed) { newOperationsDisallowed_ = disallowed; }
+  int32_t dbProductVersion() const { return dbProductVersion_; }
+  // Stores the version and writes it to the file through the guard; an unchanged value writes nothing.
+  void setDbProductVersion(int32_t version);
+  // The product version stored in the file, or -1 for a schema older than the one that stores it.
+  int32_t getDBProductVersion() const;
+  // Pending update operations by entity identifier, made on first use.
+  KRDBEntityIDMapTable& updateOperations();
+
+  // Creates or migrates the schema (an engine exception reaches the caller), then computes
+  // containsUserData. Called by the application after opening when needUpdate is true.
+  void initializeAndUpdateIfNeaded();
+  // Whether the catalog holds any image, top-level collection or referenced folder; false when the
+  // engine fails.
+  bool containsUserData(const Reactor& reactor);
+
+  // Runs the block on the dispatcher: waiting for it (sync) or queued.
+  void performSynchronously(bool sync, std::function<void()> block);
+  // Calls the handler in place (sync) or later on the main thread; a nil handler is ignored.
+  void finishHandler(const Handler& handler, bool sync);
+  template <class Result>
+  void finishHandler(const std::function<void(Result)>& handler, Result result, bool sync);
+  // Calls the block with the engine. True when it returned normally; false when there is no engine
+  // (logged) or when it threw an engine exception and `raiseException` is false; with `raiseException`
+  // the converted exception is raised. The description tags the operation in the exception.
+  bool handleDBReactorBlock(const ReactorBlock& block, const KRString& description, bool raiseException);
+
+  // The asynchronous operation pattern: nothing once new operations are disallowed; otherwise queues
+  // (or runs and waits, for sync) the worker on the dispatcher and hands its result to the handler.
+  template <class Result>
+  void performOperation(std::function<Result(KRDBCatalog& catalog)> workerSync,
+                        std::function<void(Result)> handler, bool sync);
+  // The synchronous convenience: the worker's result, or an empty one when operations are disallowed.
+  template <class Result>
+  Result performOperationAndWait(std::function<Result(KRDBCatalog& catalog)> workerSync);
+
+  // The handler runs on the main thread after every operation queued before.
+  void waitForAllDataBaseOperationsWithHandler(Handler handler);
+  // Disallows new operations at once, then, after the queued ones, closes the engine and calls the
+  // handler on the main thread.
+  void closeAfterAllDataBaseOperationsWithHandler(Handler handler);
+  // Closes the engine now (after the running operation), leaving new operations allowed.
+  void forceCloseDB();
+  // Copies the catalog file to `path` after the queued operations; the handler gets the outcome on the
+  // main thread.
+  void backupDBFileToPath(const KRString& path, std::function<void(bool)> handler);
+
+ protected:
+  KRDBCatalog() = default;
+
+ private:
+  bool openFile(const KRString& path, KRErrorPtr* error);
+  void makeDispatcher();
+  // Runs engine work that needs no guard on the queue once there is one.
+  void runOnQueue(const std::function<void()>& work) const;
+  void closeEngine();
+  std::weak_ptr<KRDBCatalog> weakSelf();
+
+  mutable std::mutex reactorMutex_;
+  Reactor dbReactor_;
+  std::shared_ptr<KRBlockDispatcher> dispatcher_;
+  std::atomic<bool> needUpdate_ = false;
+  std::atomic<bool> containsUserData_ = false;
+  std::atomic<bool> newOperationsDisallowed_ = false;
+  std::atomic<int32_t> dbProductVersion_ = -1;
+  std::once_flag updateOperationsOnce_;
+  std::shared_ptr<KRDBEntityIDMapTable> updateOperations_;
+};
+
+template <class Result>
+void KRDBCatalog::finishHandler(const std::function<void(Result)>& handler, Result result, bool sync) {
+  if (!handler) return;
+  if (sync) return handler(std::move(result));
+  asyncPerformMainThreadBlock(
+      [handler, result = std::move(result)]() mutable { handler(std::move(result)); });
+}
+
+template <class Result>
+void KRDBCatalog::performOperation(std::function<Result(KRDBCatalog& catalog)> workerSync,
+                                   std::function<void(Result)> handler, bool sync) {
+  if (isNewOperationsDisallowed()) return;
+  performSynchronously(
+      sync, [weak = weakSelf(), workerSync = std::move(workerSync), handler = std::move(handler), sync] {
+        const auto catalog = weak.lock();
+        if (catalog) catalog->finishHandler(handler, workerSync(*catalog), sync);
+      });
+}
+
+template <class Result>
+Result KRDBCatalog::performOperationAndWait(std::function<Result(KRDBCatalog& catalog)> workerSync) {
+  Result stored{};
+  performOperation<Result>(
+      std::move(workerSync), [&stored](Result result) { stored = std::move(result); }, true);
+  return stored;
+}

@@ -1,0 +1,37 @@
+#pragma once
+
+#include <cstdint>
+#include <memory>
+#include <string>
+
+#include "KRFoundation/KRObject.hpp"
+
+// The identity of one catalog object: its entity type and the id of its engine record. Immutable; the
+// hash is computed once. Any thread may use an identifier.
+class KRDBEntityID : public KRObject {
+ public:
+  static std::shared_ptr<KRDBEntityID> initWithEntityType(int64_t entityType, int64_t databaseID);
+
+  int64_t entityType() const { return entityType_; }
+  int64_t dbid() const { return dbid_; }
+  uint64_t hash() const override { return hash_; }
+
+  // True for an identifier (of this class or a subclass) with the same type and dbid.
+  bool isEqual(const std::shared_ptr<const KRObject>& other) const override;
+  // False for no identifier; otherwise whether type and dbid are both equal.
+  bool isEqualTo(const std::shared_ptr<const KRDBEntityID>& other) const;
+  // A new identifier with the same values.
+  std::shared_ptr<KRDBEntityID> copyWithZone() const;
+  // "<KRDBEntityID: 0x...: 1_42>"
+  std::string description() const override;
+
+ protected:
+  KRDBEntityID(int64_t entityType, int64_t databaseID);
+
+ private:
+  uint64_t hash_;
+  int64_t entityType_;
+  int64_t dbid_;
+};
+
+using KRDBEntityIDPtr = std::shared_ptr<KRDBEntityID>;

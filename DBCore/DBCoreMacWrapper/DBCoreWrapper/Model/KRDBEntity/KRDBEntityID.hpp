@@ -22,7 +22,7 @@ class KRDBEntityID : public KRObject {
   bool isEqualTo(const std::shared_ptr<const KRDBEntityID>& other) const;
   // A new identifier with the same values.
   std::shared_ptr<KRDBEntityID> copyWithZone() const;
-  // "<KRDBEntityID: 0x...: 1_42>"
+  // The default description, the type and the dbid: "<<KRDBEntityID: 0x...>: 1_42>".
   std::string description() const override;
 
  protected:

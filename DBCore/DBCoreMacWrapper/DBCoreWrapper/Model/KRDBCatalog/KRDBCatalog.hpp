@@ -48,6 +48,7 @@ class KRDBCatalog : public KRAbstractModel {
   void setNeedUpdate(bool needUpdate) { needUpdate_ = needUpdate; }
   bool containsUserData() const { return containsUserData_; }
   void setContainsUserData(bool containsUserData) { containsUserData_ = containsUserData; }
+  // newOperationsDisallowed: once set (when closing), asynchronous operations are dropped.
   bool isNewOperationsDisallowed() const { return newOperationsDisallowed_; }
   void setNewOperationsDisallowed(bool disallowed) { newOperationsDisallowed_ = disallowed; }
   int32_t dbProductVersion() const { return dbProductVersion_; }

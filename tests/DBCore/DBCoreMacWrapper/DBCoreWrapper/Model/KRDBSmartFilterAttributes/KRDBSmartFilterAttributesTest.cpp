@@ -2,7 +2,7 @@
 
 #include <gtest/gtest.h>
 
-#include "../../support/KREntityClassChecks.hpp"
+#include "KREntityClassChecks.hpp"
 #include "dbreffolderattrib.hpp"
 
 namespace {

@@ -134,6 +134,8 @@ void KRDBEntity::didChange(const KRDictionary& info) {
                                        : info.dictionaryByRemovingObjectForKey(kKRDBEntityDidNotChange));
 }
 
+void KRDBEntity::didChangeWithoutRecord() { didChange({{kKRDBEntityDidNotChange, true}}); }
+
 void KRDBEntity::notifyEntityWillChange(const KRDictionary& info) {
   notifyObserversWithSelector(&KRDBEntityObserver::entityWillChange, self(), info);
 }

@@ -130,18 +130,31 @@ class KRDBEntity : public KRAbstractModel {
     return typed && (static_cast<Self*>(this)->*hook)(typed);
   }
   // The setter protocol of a field that lives in the record: nothing for an equal value; otherwise
-  // will-change, store, write the record, did-change with {changeKey: true}.
+  // will-change, store, write the record, did-change with {changeKey: true}. setRecordValue compares by
+  // value, setRecordObject by object identity (an equal but distinct string, date or collection counts as a
+  // change).
   template <class T, class Write>
   void setRecordValue(T& field, T value, const char* changeKey, Write&& writeRecord) {
     if (field == value) return;
+    changeRecordField(field, std::move(value), changeKey, writeRecord);
+  }
+  template <class T, class Write>
+  void setRecordObject(T& field, T value, const char* changeKey, Write&& writeRecord) {
+    if (identical(field, value)) return;
+    changeRecordField(field, std::move(value), changeKey, writeRecord);
+  }
+  // Posts a change of a relation or cache: {kKRDBEntityDidNotChange: true}.
+  void didChangeWithoutRecord();
+  std::shared_ptr<KRDBEntity> self() { return std::static_pointer_cast<KRDBEntity>(shared_from_this()); }
+
+ private:
+  template <class T, class Write>
+  void changeRecordField(T& field, T value, const char* changeKey, Write& writeRecord) {
     willChange({});
     field = std::move(value);
     writeRecord(field);
     didChange({{changeKey, true}});
   }
-  std::shared_ptr<KRDBEntity> self() { return std::static_pointer_cast<KRDBEntity>(shared_from_this()); }
-
- private:
   const std::vector<std::string>& linkedEntitiesKeys() const {
     return entityClass().necessaryLinkedEntitiesKeys();
   }

@@ -18,6 +18,4 @@ class KRDBEntityObserver {
   virtual void entityDidChange(const std::shared_ptr<KRDBEntity>& /*entity*/, const KRDictionary& /*info*/) {}
   // A fetch request left a fresh validation record on the entity.
   virtual void validationRecordDidSet(const std::shared_ptr<KRDBEntity>& /*entity*/) {}
-  // An image's history states were replaced in memory.
-  virtual void statesDidChange(const std::shared_ptr<KRDBEntity>& /*entity*/) {}
 };

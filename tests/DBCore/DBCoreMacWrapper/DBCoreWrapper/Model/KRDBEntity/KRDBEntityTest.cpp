@@ -37,6 +37,7 @@ class KRTestEntity : public KRDBConcreteEntity<KRTestEntity, KRDBEntity, 99, 0> 
                    [this](const KRString& value) { image()->path = value.krs_wstring(); });
   }
   std::shared_ptr<DBImage> image() const { return std::dynamic_pointer_cast<DBImage>(dbentity()); }
+  void postRelationChange() { didChangeWithoutRecord(); }
 
   KRValue valueForKey(const std::string& key) const override {
     if (key == "linked") return linked;
@@ -219,6 +220,13 @@ TEST_F(KRDBEntityTest, AMarkerThatIsFalseCountsAsARecordChange) {
   entity->didChange({{kKRDBEntityDidNotChange, false}});
   EXPECT_TRUE(entity->isDbEntityChanged());
   EXPECT_EQ(observer->events[0].info.count(), 0u);
+}
+
+TEST_F(KRDBEntityTest, ARelationChangeIsPostedAsNotARecordChange) {
+  entity->postRelationChange();
+  ASSERT_EQ(observer->events.size(), 1u);
+  EXPECT_EQ(observer->events[0].info.count(), 0u);
+  EXPECT_FALSE(entity->isDbEntityChanged());
 }
 
 TEST_F(KRDBEntityTest, WillChangePassesTheInfoUnchanged) {

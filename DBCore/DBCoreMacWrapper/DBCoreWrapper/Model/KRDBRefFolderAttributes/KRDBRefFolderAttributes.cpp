@@ -5,6 +5,18 @@ bool KRDBRefFolderAttributes::storeInfoFromDBentity(const Record& record) {
 }
 
 bool KRDBRefFolderAttributes::storeInfoFromDBAttrib(
-    const std::shared_ptr<dbcore::DBRefFolderAttrib>& /*attributes*/) {
-  return true;
+    const std::shared_ptr<dbcore::DBRefFolderAttrib>& attributes) {
+  return storeAttributesFromRecord(attributes);
+}
+
+std::shared_ptr<dbcore::DBRefFolderAttrib> KRDBRefFolderAttributes::dbattrib() const {
+  return std::dynamic_pointer_cast<dbcore::DBRefFolderAttrib>(dbentity());
+}
+
+void KRDBRefFolderAttributes::setFavorite(bool favorite) {
+  setRecordFavorite<dbcore::DBRefFolderAttrib>(favorite);
+}
+
+void KRDBRefFolderAttributes::setSelectedFilterTypes(const KRSet& selectedFilterTypes) {
+  setRecordSelectedFilterTypes<dbcore::DBRefFolderAttrib>(selectedFilterTypes);
 }

@@ -5,6 +5,14 @@ bool KRDBSmartFilterAttributes::storeInfoFromDBentity(const Record& record) {
 }
 
 bool KRDBSmartFilterAttributes::storeInfoFromDBAttrib(
-    const std::shared_ptr<dbcore::DBSmartFilterAttrib>& /*attributes*/) {
-  return true;
+    const std::shared_ptr<dbcore::DBSmartFilterAttrib>& attributes) {
+  return storeAttributesFromRecord(attributes);
+}
+
+std::shared_ptr<dbcore::DBSmartFilterAttrib> KRDBSmartFilterAttributes::dbattrib() const {
+  return std::dynamic_pointer_cast<dbcore::DBSmartFilterAttrib>(dbentity());
+}
+
+void KRDBSmartFilterAttributes::setSelectedFilterTypes(const KRSet& selectedFilterTypes) {
+  setRecordSelectedFilterTypes<dbcore::DBSmartFilterAttrib>(selectedFilterTypes);
 }

@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include "../KRDBBaseFolderAttributes/KRFolderAttributesChecks.hpp"
 #include "KREntityClassChecks.hpp"
 #include "dbsmartfilterattrib.hpp"
 
@@ -25,6 +26,20 @@ TEST(KRDBCollectionAttributesTest, MarkedToDeleteComesFromTheRecord) {
 
 TEST(KRDBCollectionAttributesTest, NoRecordOrAForeignRecordIsRefused) {
   Checks::expectForeignRecordsRefused();
+}
+
+using Fields = KRFolderAttributesChecks<KRDBCollectionAttributes, dbcore::DBFilterAttrib>;
+
+TEST(KRDBCollectionAttributesTest, TheRecordGivesTheFields) { Fields::expectLoadedFromRecord(); }
+
+TEST(KRDBCollectionAttributesTest, TheStoreHookTakesAFresherRecord) { Fields::expectStoreHookReloads(); }
+
+TEST(KRDBCollectionAttributesTest, StoredFieldsFollowTheSetterProtocol) {
+  Fields::expectSettersFollowTheProtocol();
+}
+
+TEST(KRDBCollectionAttributesTest, FilterTypeSetsAreComparedByIdentity) {
+  Fields::expectSetsComparedByIdentity();
 }
 
 }  // namespace

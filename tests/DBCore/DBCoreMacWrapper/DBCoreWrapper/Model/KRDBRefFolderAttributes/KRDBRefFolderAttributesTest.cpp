@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include "../KRDBBaseFolderAttributes/KRFolderAttributesChecks.hpp"
 #include "KREntityClassChecks.hpp"
 #include "dbfilterattrib.hpp"
 
@@ -25,6 +26,20 @@ TEST(KRDBRefFolderAttributesTest, MarkedToDeleteComesFromTheRecord) {
 
 TEST(KRDBRefFolderAttributesTest, NoRecordOrAForeignRecordIsRefused) {
   Checks::expectForeignRecordsRefused();
+}
+
+using Fields = KRFolderAttributesChecks<KRDBRefFolderAttributes, dbcore::DBRefFolderAttrib>;
+
+TEST(KRDBRefFolderAttributesTest, TheRecordGivesTheFields) { Fields::expectLoadedFromRecord(); }
+
+TEST(KRDBRefFolderAttributesTest, TheStoreHookTakesAFresherRecord) { Fields::expectStoreHookReloads(); }
+
+TEST(KRDBRefFolderAttributesTest, StoredFieldsFollowTheSetterProtocol) {
+  Fields::expectSettersFollowTheProtocol();
+}
+
+TEST(KRDBRefFolderAttributesTest, FilterTypeSetsAreComparedByIdentity) {
+  Fields::expectSetsComparedByIdentity();
 }
 
 }  // namespace

@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include "../KRDBBaseFolderAttributes/KRFolderAttributesChecks.hpp"
 #include "KREntityClassChecks.hpp"
 #include "dbreffolderattrib.hpp"
 
@@ -25,6 +26,31 @@ TEST(KRDBSmartFilterAttributesTest, MarkedToDeleteComesFromTheRecord) {
 
 TEST(KRDBSmartFilterAttributesTest, NoRecordOrAForeignRecordIsRefused) {
   Checks::expectForeignRecordsRefused();
+}
+
+using Fields = KRFolderAttributesChecks<KRDBSmartFilterAttributes, dbcore::DBSmartFilterAttrib>;
+
+TEST(KRDBSmartFilterAttributesTest, TheRecordGivesTheFields) { Fields::expectLoadedFromRecord(); }
+
+TEST(KRDBSmartFilterAttributesTest, TheStoreHookTakesAFresherRecord) { Fields::expectStoreHookReloads(); }
+
+TEST(KRDBSmartFilterAttributesTest, StoredFieldsFollowTheSetterProtocol) {
+  Fields::expectSettersFollowTheProtocol();
+}
+
+TEST(KRDBSmartFilterAttributesTest, FilterTypeSetsAreComparedByIdentity) {
+  Fields::expectSetsComparedByIdentity();
+}
+
+TEST(KRDBSmartFilterAttributesTest, TheFavoriteFlagIsNeitherStoredNorPosted) {
+  const auto attributes = Fields::entity();
+  const auto observer = KREntityObserverRecorder::observing(*attributes);
+  attributes->setFavorite(true);
+  EXPECT_TRUE(attributes->isFavorite());
+  EXPECT_TRUE(observer->events.empty());
+  EXPECT_FALSE(attributes->isDbEntityChanged());
+  EXPECT_TRUE(attributes->storeInfoFromDBentity(attributes->dbentity()));
+  EXPECT_TRUE(attributes->isFavorite());
 }
 
 }  // namespace

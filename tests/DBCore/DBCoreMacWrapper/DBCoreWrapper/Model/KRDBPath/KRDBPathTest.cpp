@@ -2,6 +2,8 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+
 #include "KREntityClassChecks.hpp"
 #include "KRFoundation/KRRunLoop.hpp"
 #include "KRRecordPropertyChecks.hpp"

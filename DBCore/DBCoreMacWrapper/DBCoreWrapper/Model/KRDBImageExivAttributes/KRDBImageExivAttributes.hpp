@@ -105,13 +105,13 @@ class KRDBImageExivAttributes
   int32_t version() const { return version_; }
   void setVersion(int32_t version);
 
+  // Drops the back reference and the base's cached relations.
+  void reset() override;
   // The image: the back reference, else asked of the context on first read; nil without a context.
   std::shared_ptr<KRDBImage> image();
   std::shared_ptr<KRDBImage> imagePrimitive() const { return image_.lock(); }
   // Sets the back reference without notification. Held weakly: the image holds its exif attributes.
   void setImagePrimitive(const std::shared_ptr<KRDBImage>& image) { image_ = image; }
-  // The base's, and the back reference is dropped.
-  void reset() override;
 
   KRValue valueForKey(const std::string& key) const override;
   void setValueForKey(const KRValue& value, const std::string& key) override;

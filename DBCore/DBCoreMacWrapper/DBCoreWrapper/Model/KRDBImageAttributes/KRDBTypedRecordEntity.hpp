@@ -53,7 +53,8 @@ struct KRDBRecordFieldConversion {
   }
 };
 
-// Key-value access to one property of an entity class: a getter and, unless read-only, a setter.
+// Key-value access to one property of an entity class: a getter and, unless read-only, a setter. The
+// tables are built once and only read; they are used on the entity's thread.
 template <class Self>
 struct KRDBKeyAccessor {
   std::function<KRValue(const Self&)> get;

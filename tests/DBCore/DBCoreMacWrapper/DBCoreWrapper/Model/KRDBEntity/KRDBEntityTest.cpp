@@ -10,6 +10,7 @@
 #include "Model/KRDBEntity/KRDBEntityClasses.hpp"
 #include "Model/KRDBEntityFavoriteAlias/KRDBEntityFavoriteAlias.hpp"
 #include "Model/KRDBImage/KRDBImage.hpp"
+#include "Model/KRDBImageState/KRDBImageState.hpp"
 #include "dbentityfavoritealias.hpp"
 #include "dbimage.hpp"
 #include "dbpath.hpp"
@@ -287,10 +288,11 @@ TEST_F(KRDBEntityTest, ALoudUpdatePostsAroundTheChangeAndMarksTheEntity) {
 // ---- Necessary linked entities
 
 TEST_F(KRDBEntityTest, AClassWithoutNecessaryKeysNeedsNothing) {
-  const auto image = KRDBImage::initWithDBEntity(imageRecord(1));
+  const auto state = KRDBImageState::initWithDBEntity(std::make_shared<dbcore::DBImgHistoryState>());
   EXPECT_TRUE(KRDBEntity::necessaryLinkedEntitiesKeys().empty());
-  EXPECT_FALSE(image->needFetchNecessaryEntities());
-  EXPECT_EQ(image->necessaryLinkedEntitiesDictionary().count(), 0u);
+  EXPECT_TRUE(KRDBImageState::necessaryLinkedEntitiesKeys().empty());
+  EXPECT_FALSE(state->needFetchNecessaryEntities());
+  EXPECT_EQ(state->necessaryLinkedEntitiesDictionary().count(), 0u);
 }
 
 TEST_F(KRDBEntityTest, AMissingNecessaryEntityIsNeededAndLeftOutOfTheDictionary) {

@@ -2,8 +2,8 @@
 
 #include <gtest/gtest.h>
 
-#include "KRAnsweringFolderContext.hpp"
 #include "KREntityObserverRecorder.hpp"
+#include "KRRecordingEntityContext.hpp"
 #include "Model/KRDBCollection/KRDBCollection.hpp"
 #include "Model/KRDBCollectionAttributes/KRDBCollectionAttributes.hpp"
 #include "Model/KRDBEntity/KRDBEntityClasses.hpp"
@@ -38,7 +38,7 @@ class KRDBAbstractBaseFolderTest : public testing::Test {
     observer->events.clear();
   }
 
-  std::shared_ptr<KRAnsweringFolderContext> context = std::make_shared<KRAnsweringFolderContext>();
+  std::shared_ptr<KRRecordingEntityContext> context = std::make_shared<KRRecordingEntityContext>();
   std::shared_ptr<KRDBCollection> folder = collection();
   std::shared_ptr<KREntityObserverRecorder> observer;
   std::shared_ptr<KRDBEntity> a = collection(2), b = collection(3), c = collection(4);

@@ -2,9 +2,9 @@
 
 #include <gtest/gtest.h>
 
-#include "../KRDBAbstractBaseFolder/KRAnsweringFolderContext.hpp"
 #include "KREntityClassChecks.hpp"
 #include "KRRecordPropertyChecks.hpp"
+#include "KRRecordingEntityContext.hpp"
 #include "dbsmartfilter.hpp"
 
 namespace {
@@ -69,7 +69,7 @@ TEST(KRDBCollectionTest, TheOrderIsKeptWholeUntilReloaded) {
 
 TEST(KRDBCollectionTest, ImagesJoinAndLeaveThroughTheContext) {
   const auto folder = collection();
-  const auto context = std::make_shared<KRAnsweringFolderContext>();
+  const auto context = std::make_shared<KRRecordingEntityContext>();
   folder->setContext(context);
   const std::shared_ptr<KRDBEntity> image = collection();
   folder->addImages({image});

@@ -93,33 +93,6 @@ std::shared_ptr<KRTCropDescription> crop(double width, double height, double ima
                                               KRSize{imageWidth, imageHeight});
 }
 
-// A context that answers the image's relations with what the test put in it.
-class ImageContext : public KRRecordingEntityContext {
- public:
-  std::shared_ptr<KRDBImageAttributes> attributes;
-  std::shared_ptr<KRDBImageExivAttributes> exivAttributes;
-  KRDBEntitySet filters;
-  KRDBImageStates states;
-
-  std::shared_ptr<KRDBImageAttributes> attributesForImage(const std::shared_ptr<KRDBImage>& image) override {
-    KRRecordingEntityContext::attributesForImage(image);
-    return attributes;
-  }
-  std::shared_ptr<KRDBImageExivAttributes> exivAttributesForImage(
-      const std::shared_ptr<KRDBImage>& image) override {
-    KRRecordingEntityContext::exivAttributesForImage(image);
-    return exivAttributes;
-  }
-  KRDBEntitySet filtersOfImage(const std::shared_ptr<KRDBImage>& image) override {
-    KRRecordingEntityContext::filtersOfImage(image);
-    return filters;
-  }
-  KRDBImageStates statesForImage(const std::shared_ptr<KRDBImage>& image) override {
-    KRRecordingEntityContext::statesForImage(image);
-    return states;
-  }
-};
-
 // Records the image notifications as their names.
 class ImageRecorder : public KRObject, public KRDBImageObserver {
  public:
@@ -147,7 +120,7 @@ class KRDBImageBehaviourTest : public testing::Test {
 
   std::shared_ptr<KRDBImage> image = makeImage();
   std::shared_ptr<ImageRecorder> recorder = std::make_shared<ImageRecorder>();
-  std::shared_ptr<ImageContext> context = std::make_shared<ImageContext>();
+  std::shared_ptr<KRRecordingEntityContext> context = std::make_shared<KRRecordingEntityContext>();
 };
 
 // ---- Record properties

@@ -6,9 +6,9 @@
 #include <string>
 #include <vector>
 
-#include "../KRDBImageAttributes/KRRecordFieldRows.hpp"
 #include "KREntityClassChecks.hpp"
 #include "KREntityObserverRecorder.hpp"
+#include "KRRecordFieldRows.hpp"
 #include "dbuserimgattrib.hpp"
 
 namespace {

@@ -5,9 +5,9 @@
 #include <string>
 #include <vector>
 
-#include "../KRDBImageAttributes/KRRecordFieldRows.hpp"
 #include "KREntityClassChecks.hpp"
 #include "KREntityObserverRecorder.hpp"
+#include "KRRecordFieldRows.hpp"
 #include "Support/KRDBRecordConversions.hpp"
 #include "dbimage.hpp"
 

@@ -54,17 +54,6 @@ class PathEventsRecorder : public KRObject, public KRDBEntityObserver, public KR
   std::vector<KRDictionary> didChangeInfos;
 };
 
-// A recording context that answers one volume for every path.
-class VolumeAnsweringContext : public KRRecordingEntityContext {
- public:
-  std::shared_ptr<KRDBVolume> volumeForPath(const std::shared_ptr<KRDBPath>& path) override {
-    KRRecordingEntityContext::volumeForPath(path);
-    return volume;
-  }
-
-  std::shared_ptr<KRDBVolume> volume;
-};
-
 KRMountEntry photoDisk(std::string mountPoint) {
   return {.mountPoint = std::move(mountPoint),
           .device = "/dev/sdb1",
@@ -204,7 +193,7 @@ TEST_F(KRDBPathEntityTest, WithoutAContextThereIsNoVolume) {
 }
 
 TEST_F(KRDBPathEntityTest, TheVolumeIsAskedFromTheContextOnceAndListenedTo) {
-  const auto context = std::make_shared<VolumeAnsweringContext>();
+  const auto context = std::make_shared<KRRecordingEntityContext>();
   context->volume = volumeEntity(5, "/media/photos", table);
   const auto path = makePath();
   path->setContext(context);
@@ -217,7 +206,7 @@ TEST_F(KRDBPathEntityTest, TheVolumeIsAskedFromTheContextOnceAndListenedTo) {
 }
 
 TEST_F(KRDBPathEntityTest, AContextWithoutVolumeIsAskedAgain) {
-  const auto context = std::make_shared<VolumeAnsweringContext>();
+  const auto context = std::make_shared<KRRecordingEntityContext>();
   const auto path = makePath();
   path->setContext(context);
   EXPECT_EQ(path->volume(), nullptr);

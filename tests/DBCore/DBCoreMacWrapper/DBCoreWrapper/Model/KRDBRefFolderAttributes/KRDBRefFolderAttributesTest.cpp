@@ -2,8 +2,8 @@
 
 #include <gtest/gtest.h>
 
-#include "../KRDBBaseFolderAttributes/KRFolderAttributesChecks.hpp"
 #include "KREntityClassChecks.hpp"
+#include "KRFolderAttributesChecks.hpp"
 #include "dbfilterattrib.hpp"
 
 namespace {

@@ -2,10 +2,10 @@
 
 #include <gtest/gtest.h>
 
-#include "../KRDBAbstractBaseFolder/KRAnsweringFolderContext.hpp"
 #include "KREntityClassChecks.hpp"
 #include "KREntityObserverRecorder.hpp"
 #include "KRRecordPropertyChecks.hpp"
+#include "KRRecordingEntityContext.hpp"
 #include "Model/KRDBEntity/KRDBEntityClasses.hpp"
 #include "Model/KRDBPath/KRDBPath.hpp"
 #include "Model/KRDBReferencedFolder/KRDBReferencedFolderObserver.hpp"
@@ -77,7 +77,7 @@ class KRDBReferencedFolderBehaviourTest : public testing::Test {
     folder->setContext(context);
   }
   std::shared_ptr<KRDBReferencedFolder> folder = tripFolder();
-  std::shared_ptr<KRAnsweringFolderContext> context = std::make_shared<KRAnsweringFolderContext>();
+  std::shared_ptr<KRRecordingEntityContext> context = std::make_shared<KRRecordingEntityContext>();
   std::shared_ptr<KRDBReferencedFolder> first, second;
 };
 

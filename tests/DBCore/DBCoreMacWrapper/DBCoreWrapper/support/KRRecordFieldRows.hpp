@@ -25,32 +25,12 @@ KRRecordProperty<Entity> recordFieldRow(const std::string& name, const std::stri
           [setter, getter](Entity& entity) { (entity.*setter)((entity.*getter)()); }};
 }
 
-// A context that answers one image for attribute lookups and records the entity it was asked about.
-class KRImageAnsweringContext : public KRRecordingEntityContext {
- public:
-  std::shared_ptr<KRDBImage> image;
-  std::shared_ptr<KRDBEntity> askedFor;
-
-  std::shared_ptr<KRDBImage> imageForAttributes(
-      const std::shared_ptr<KRDBImageAttributes>& attributes) override {
-    KRRecordingEntityContext::imageForAttributes(attributes);
-    askedFor = std::static_pointer_cast<KRDBEntity>(attributes);
-    return image;
-  }
-  std::shared_ptr<KRDBImage> imageForExivAttributes(
-      const std::shared_ptr<KRDBImageExivAttributes>& attributes) override {
-    KRRecordingEntityContext::imageForExivAttributes(attributes);
-    askedFor = std::static_pointer_cast<KRDBEntity>(attributes);
-    return image;
-  }
-};
-
 // The lazy image of an attribute entity: nil without a context; asked once of the context, which is told
 // the entity, under the operation name `operation`; kept weakly; dropped by reset.
 template <class Entity>
 void expectLazyImage(const std::shared_ptr<Entity>& entity, const std::string& operation) {
   EXPECT_EQ(entity->image(), nullptr);
-  const auto context = std::make_shared<KRImageAnsweringContext>();
+  const auto context = std::make_shared<KRRecordingEntityContext>();
   context->image = KRDBImage::initWithDBEntity(std::make_shared<dbcore::DBImage>());
   entity->setContext(context);
   EXPECT_EQ(entity->image(), context->image);
@@ -68,7 +48,7 @@ void expectLazyImage(const std::shared_ptr<Entity>& entity, const std::string& o
 // The back reference is set without notification, held weakly, and a set one is answered without asking.
 template <class Entity>
 void expectWeakImagePrimitive(const std::shared_ptr<Entity>& entity) {
-  const auto context = std::make_shared<KRImageAnsweringContext>();
+  const auto context = std::make_shared<KRRecordingEntityContext>();
   entity->setContext(context);
   const auto observer = KREntityObserverRecorder::observing(*entity);
   auto image = KRDBImage::initWithDBEntity(std::make_shared<dbcore::DBImage>());

@@ -5,7 +5,7 @@
 #include <string>
 
 #include "Model/KRDBEntity/KRDBConcreteEntity.hpp"
-#include "Model/KRDBImageAttributes/KRDBTypedRecordEntity.hpp"
+#include "Model/KRDBEntity/KRDBTypedRecordEntity.hpp"
 #include "dbexivimgattrib.hpp"
 
 extern const char* const kKRDBImageExivAttributesDidChangeIsoSpeed;

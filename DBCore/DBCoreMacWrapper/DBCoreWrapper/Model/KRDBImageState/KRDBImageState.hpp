@@ -6,7 +6,7 @@
 
 #include "KRClasses/KRTCropDescription.hpp"
 #include "Model/KRDBEntity/KRDBConcreteEntity.hpp"
-#include "Model/KRDBImageAttributes/KRDBTypedRecordEntity.hpp"
+#include "Model/KRDBEntity/KRDBTypedRecordEntity.hpp"
 #include "dbimghistorystate.hpp"
 
 extern const char* const kKRDBImageStateDidChangeActionName;

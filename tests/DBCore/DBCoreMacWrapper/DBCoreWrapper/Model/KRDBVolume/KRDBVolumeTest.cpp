@@ -2,9 +2,8 @@
 
 #include <gtest/gtest.h>
 
-#include <regex>
-
 #include "KREntityClassChecks.hpp"
+#include "KRFoundation/KRRegularExpression.hpp"
 #include "KRFoundation/KRRunLoop.hpp"
 #include "KRRecordPropertyChecks.hpp"
 #include "Model/KRDBVolume/KRDBVolumeObserver.hpp"
@@ -126,8 +125,9 @@ TEST_F(KRDBVolumeEntityTest, AMissingUuidIsMadeOnFirstReadAndKept) {
   const auto volume = KRDBVolume::initWithDBEntity(record);
   const auto observer = KREntityObserverRecorder::observing(*volume);
   const KRString first = volume->uuid();
-  EXPECT_TRUE(std::regex_match(
-      first.str(), std::regex("[0-9A-F]{8}-[0-9A-F]{4}-4[0-9A-F]{3}-[89AB][0-9A-F]{3}-[0-9A-F]{12}")));
+  const KRRegularExpression canonical("[0-9A-F]{8}-[0-9A-F]{4}-4[0-9A-F]{3}-[89AB][0-9A-F]{3}-[0-9A-F]{12}",
+                                      false, false);
+  EXPECT_TRUE(canonical.matches(first.str()));
   EXPECT_EQ(record->uuid, first.krs_wstring());
   EXPECT_TRUE(volume->isDbEntityChanged());
   ASSERT_EQ(observer->kinds(), Events{"didChange"});

@@ -5,15 +5,29 @@
 #include <functional>
 #include <memory>
 #include <mutex>
+#include <vector>
 
 #include "KRClasses/KRAbstractModel.hpp"
 #include "KRClasses/KRBlockDispatcher.hpp"
 #include "KRFoundation/KRError.hpp"
 #include "Model/KRDBEntity/KRDBDataStorageCreating.hpp"
+#include "Model/KRDBEntity/KRDBEntityID.hpp"
 
 namespace dbcore {
 class DBReactor;
 }
+class KRDBEntity;
+class KRDBImage;
+class KRDBImageAttributes;
+class KRDBImageExivAttributes;
+class KRDBCollection;
+class KRDBCollectionAttributes;
+class KRDBReferencedFolder;
+class KRDBRefFolderAttributes;
+class KRDBSmartFilter;
+class KRDBSmartFilterAttributes;
+
+using KRDBEntityArray = std::vector<std::shared_ptr<KRDBEntity>>;
 
 // The gateway to one catalog file: opens it through the engine, keeps the product version stored in it,
 // and runs every engine operation on one serial queue (the dispatcher) inside an exception guard that
@@ -56,8 +70,10 @@ class KRDBCatalog : public KRAbstractModel {
   void setDbProductVersion(int32_t version);
   // The product version stored in the file, or -1 for a schema older than the one that stores it.
   int32_t getDBProductVersion() const;
-  // Pending update operations by entity identifier, made on first use.
+  // Pending update operations by entity identifier, made on first use. Written from the caller's thread and
+  // the queue: hold updateOperationsLock() while using it.
   KRDBEntityIDMapTable& updateOperations();
+  std::mutex& updateOperationsLock() { return updateOperationsMutex_; }
 
   // Creates or migrates the schema (an engine exception reaches the caller), then computes
   // containsUserData. Called by the application after opening when needUpdate is true.
@@ -97,6 +113,66 @@ class KRDBCatalog : public KRAbstractModel {
   // main thread.
   void backupDBFileToPath(const KRString& path, std::function<void(bool)> handler);
 
+  // ---- Creation (KRDBCatalogCreation.cpp). The Sync forms run on the queue.
+  using EntityHandler = std::function<void(std::shared_ptr<KRDBEntity>)>;
+  using EntitiesHandler = std::function<void(KRDBEntityArray)>;
+  // A new record of the type built from the info, wrapped as its entity; nil for a type that cannot be
+  // created this way.
+  std::shared_ptr<KRDBEntity> createEntityWithTypeSync(int64_t entityType,
+                                                       const KRDictionary& additionalInfo);
+  KRDBEntityArray createEntitiesWithTypeSync(int64_t entityType,
+                                             const std::vector<KRDictionary>& entitiesInfo);
+  KRDBEntityArray createDBImagesWithEntitiesInfo(const std::vector<KRDictionary>& entitiesInfo);
+  KRDBEntityArray createDBPathsWithEntitiesInfo(const std::vector<KRDictionary>& entitiesInfo);
+  KRDBEntityArray createDBRefFoldersWithEntitiesInfo(const std::vector<KRDictionary>& entitiesInfo);
+  void createEntityWithType(int64_t entityType, const KRDictionary& additionalInfo, EntityHandler handler,
+                            bool sync);
+  void createEntityWithType(int64_t entityType, EntityHandler handler, bool sync);
+  void createEntitiesWithType(int64_t entityType, const std::vector<KRDictionary>& entitiesInfo,
+                              EntitiesHandler handler, bool sync);
+
+  // ---- Attribute records of images and folders (KRDBCatalogCreation.cpp). A folder without one gets one.
+  std::shared_ptr<KRDBImageAttributes> fetchAttributesForImageSync(const std::shared_ptr<KRDBImage>& image);
+  std::shared_ptr<KRDBImageExivAttributes> fetchExivAttributesForImageSync(
+      const std::shared_ptr<KRDBImage>& image);
+  std::shared_ptr<KRDBCollectionAttributes> fetchAttributesForFilterSync(
+      const std::shared_ptr<KRDBCollection>& filter);
+  std::shared_ptr<KRDBRefFolderAttributes> fetchAttributesForRefFolderSync(
+      const std::shared_ptr<KRDBReferencedFolder>& folder);
+  std::shared_ptr<KRDBSmartFilterAttributes> fetchAttributesForSmartFilterSync(
+      const std::shared_ptr<KRDBSmartFilter>& filter);
+  // Attaches the folder's attributes; answers the linked entities attached (empty or the attributes).
+  KRDBEntityArray additionalFetchingForFilter(const std::shared_ptr<KRDBCollection>& filter);
+  KRDBEntityArray additionalFetchingForSmartFilter(const std::shared_ptr<KRDBSmartFilter>& filter);
+
+  // ---- Fetch, update, deletion, dangling records (KRDBCatalogStorage.cpp)
+  using StringsHandler = std::function<void(std::vector<KRString>)>;
+  std::shared_ptr<KRDBEntity> fetchEntityWithIDSync(const KRDBEntityIDPtr& entityID);
+  // Never raises: an engine failure hands nil to the handler.
+  void fetchEntityWithID(const KRDBEntityIDPtr& entityID, EntityHandler handler, bool sync);
+  std::shared_ptr<KRDBEntity> fetchEntityWithID(const KRDBEntityIDPtr& entityID);
+  void updateEntitySync(const std::shared_ptr<KRDBEntity>& entity);
+  // Writes a snapshot of the entity later; a newer call for the same entity before the queue reaches the
+  // older one replaces it.
+  void updateEntity(const std::shared_ptr<KRDBEntity>& entity);
+  void updateEntitiesSync(const KRDBEntityArray& entities);
+  // Queues snapshots of the changed entities and marks them unchanged.
+  void updateEntities(const KRDBEntityArray& entities);
+  void deleteEntitySync(const std::shared_ptr<KRDBEntity>& entity);
+  void deleteEntity(const std::shared_ptr<KRDBEntity>& entity);
+  void deleteImagesSync(const KRDBEntityArray& images);
+  void deleteImages(const KRDBEntityArray& images);
+  std::vector<KRString> fetchUUIDsOfDanglingStatesSync();
+  void fetchUUIDsOfDanglingStatesWithHandler(StringsHandler handler, bool sync);
+  void deleteDanglingPathesSync();
+  void deleteDanglingDBPathesWithHandler(Handler handler, bool sync);
+  void deleteDanglingHistoryStatesSync();
+  void deleteDanglingHistoryStatesWithHandler(Handler handler, bool sync);
+  std::vector<KRString> fetchNamesOfDanglingHistoryResourcesSync();
+  void fetchNamesOfDanglingHistoryResourcesWithHandler(StringsHandler handler, bool sync);
+  void deleteDanglingHistoryResourcesSync();
+  void deleteDanglingHistoryResourcesWithHandler(Handler handler, bool sync);
+
  protected:
   KRDBCatalog() = default;
 
@@ -116,6 +192,7 @@ class KRDBCatalog : public KRAbstractModel {
   std::atomic<bool> newOperationsDisallowed_ = false;
   std::atomic<int32_t> dbProductVersion_ = -1;
   std::once_flag updateOperationsOnce_;
+  std::mutex updateOperationsMutex_;
   std::shared_ptr<KRDBEntityIDMapTable> updateOperations_;
 };
 

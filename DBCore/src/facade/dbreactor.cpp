@@ -53,6 +53,7 @@ DBConnection& DBReactor::connection() const {
 }
 
 int DBReactor::Open(const std::wstring& path, const std::wstring&) {
+  if (connection_ && connection_->inTransaction()) return kDBOpenFailed;
   Close();
   if (path.find(L'\0') != std::wstring::npos) return kDBOpenFailed;
   const std::string file = ws2s(path);
@@ -105,6 +106,8 @@ void DBReactor::Initialize() {
 }
 
 void DBReactor::Close() {
+  if (connection_ && connection_->inTransaction())
+    throw DBException("The catalog cannot be closed in a batch");
   stamp_.reset();
   connection_.reset();
 }

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
 #include <map>
 #include <memory>
 #include <set>
@@ -82,11 +83,19 @@ class DBReactor {
   DBReactor(const DBReactor&) = delete;
   DBReactor& operator=(const DBReactor&) = delete;
 
-  // Life. Open never throws; see DBOpenResult. The key is not used.
+  // Life. Open never throws; see DBOpenResult. Inside a Batch it fails and keeps the catalog open. The key
+  // is not used.
   int Open(const std::wstring& path, const std::wstring& key);
   void Initialize();
+  // Throws DBException inside a Batch.
   void Close();
   bool Backup(const std::wstring& path);
+
+  // Runs the body's facade calls under one commit. Each facade call inside stays atomic on its own (a call
+  // that fails leaves nothing of itself); when the body throws, the calls that succeeded before it are
+  // committed and the exception passes on unchanged. Nested Batch calls join the outer one. A commit that
+  // fails rolls the whole batch back and throws DBException (instead of the body's exception, if any).
+  void Batch(const std::function<void()>& body);
 
   // Versions.
   int DBUserVersion() const;

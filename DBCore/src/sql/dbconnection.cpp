@@ -1,5 +1,7 @@
 #include "dbconnection.hpp"
 
+#include <exception>
+
 #include "dbexception.hpp"
 
 namespace dbcore {
@@ -74,6 +76,10 @@ DBStatementLease DBConnection::prepare(const std::string& sql) {
 }
 
 void DBConnection::transaction(const std::function<void()>& body) {
+  // SQLite rolls a whole transaction back on some errors (a full disk, say): a savepoint opened then
+  // would start a transaction of its own and commit apart from the one it was meant to join.
+  if (transactionDepth_ > 0 && sqlite3_get_autocommit(db_))
+    throw DBException("The open transaction was rolled back by an earlier error");
   const std::string savepoint = "kr_sp" + std::to_string(transactionDepth_);
   exec(transactionDepth_ == 0 ? "BEGIN IMMEDIATE" : "SAVEPOINT " + savepoint);
   ++transactionDepth_;
@@ -94,6 +100,28 @@ void DBConnection::transaction(const std::function<void()>& body) {
     exec("RELEASE " + savepoint);
     return;
   }
+  commit();
+}
+
+void DBConnection::commitTogether(const std::function<void()>& body) {
+  if (transactionDepth_ > 0) {
+    body();
+    return;
+  }
+  exec("BEGIN IMMEDIATE");
+  ++transactionDepth_;
+  std::exception_ptr failure;
+  try {
+    body();
+  } catch (...) {
+    failure = std::current_exception();
+  }
+  --transactionDepth_;
+  commit();
+  if (failure) std::rethrow_exception(failure);
+}
+
+void DBConnection::commit() {
   try {
     exec("COMMIT");
   } catch (...) {

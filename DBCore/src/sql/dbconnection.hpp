@@ -39,6 +39,12 @@ class DBConnection {
   // Runs the body atomically: in a transaction, or a savepoint when one is already open. An exception
   // leaving the body rolls back everything it wrote and passes on.
   void transaction(const std::function<void()>& body);
+  // Runs the body in one transaction that the body's own transactions join as savepoints, and commits it
+  // when the body ends, also when the body throws: each of those transactions has already rolled back
+  // what it wrote itself, so what completed is kept, and the exception passes on. Inside an open
+  // transaction the body simply joins it. Throws DBException, after rolling back, when the commit fails.
+  void commitTogether(const std::function<void()>& body);
+  bool inTransaction() const { return transactionDepth_ > 0; }
 
   int64_t lastInsertRowId() const { return sqlite3_last_insert_rowid(db_); }
   int changes() const { return sqlite3_changes(db_); }
@@ -47,6 +53,7 @@ class DBConnection {
 
  private:
   void configure();
+  void commit();
 
   sqlite3* db_ = nullptr;
   DBStatementCache statements_;

@@ -1,5 +1,7 @@
 #include "dbidentitystamp.hpp"
 
+#include <utility>
+
 namespace dbcore {
 
 namespace {
@@ -27,6 +29,10 @@ void DBIdentityStamp::stamp() {
 }
 
 void DBIdentityStamp::checkpoint() {
+  if (!sqlite3_get_autocommit(db_)) {
+    checkpointAfterCommit_ = true;
+    return;
+  }
   int logFrames = 0;
   int movedFrames = 0;
   const int code =
@@ -44,6 +50,10 @@ void DBIdentityStamp::committed(int frames) {
   if (stamping_) return;
   const bool restarted = frames < lastFrames_;
   lastFrames_ = frames;
+  if (std::exchange(checkpointAfterCommit_, false)) {
+    checkpoint();
+    return;
+  }
   if (frames >= kCheckpointFrames) {
     int logFrames = 0;
     int movedFrames = 0;

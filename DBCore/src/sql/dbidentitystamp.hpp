@@ -20,7 +20,8 @@ class DBIdentityStamp {
 
   // Rewrites the page of `catalog_info` in a transaction of its own; best effort, like any checkpoint.
   void stamp();
-  // Moves the log into the main file and empties it, then stamps the log's next generation.
+  // Moves the log into the main file and empties it, then stamps the log's next generation. Inside an
+  // open transaction, where no checkpoint can run, it runs after the next commit.
   void checkpoint();
 
   // The log size at which a commit checkpoints, as SQLite's automatic checkpoint does.
@@ -33,6 +34,7 @@ class DBIdentityStamp {
   sqlite3* db_;
   int lastFrames_ = 0;
   bool stamping_ = false;
+  bool checkpointAfterCommit_ = false;
 };
 
 }  // namespace dbcore

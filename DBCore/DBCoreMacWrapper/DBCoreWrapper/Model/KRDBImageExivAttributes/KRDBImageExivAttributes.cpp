@@ -1,6 +1,7 @@
 #include "Model/KRDBImageExivAttributes/KRDBImageExivAttributes.hpp"
 
 #include "Model/KRDBImage/KRDBImage.hpp"
+#include "Model/KRDBImageExivAttributes/KRDBExifReader.hpp"
 
 using dbcore::DBExivImgAttrib;
 
@@ -207,6 +208,50 @@ void KRDBImageExivAttributes::setFullFilled(bool fullFilled) {
 
 void KRDBImageExivAttributes::setVersion(int32_t version) {
   setRecordField(version_, version, kKRDBImageExivAttributesDidChangeVersion, &DBExivImgAttrib::version);
+}
+
+namespace {
+
+// Stores a reader's value into a record field, converted as the setters convert it.
+template <class Field, class T>
+void put(Field& field, const T& value) {
+  field = KRDBRecordFieldConversion::toRecord<Field>(value);
+}
+
+}  // namespace
+
+void KRDBImageExivAttributes::updateByExifReader(const std::shared_ptr<KRDBExifReader>& reader) {
+  const auto attributes = typedRecord();
+  if (!reader || !attributes) return;
+  DBExivImgAttrib& record = *attributes;
+  const KRDBExifReader& exif = *reader;
+  put(record.iso_speed, exif.isoSpeed());
+  put(record.shutter_speed, exif.shutterSpeed());
+  put(record.f_number, exif.fNumber());
+  put(record.focal_length, exif.focalLength());
+  put(record.focal_length35, exif.focalLength35());
+  put(record.ev, exif.ev());
+  put(record.min_focal_length, exif.minFocalLength());
+  put(record.max_focal_length, exif.maxFocalLength());
+  put(record.min_shutter, exif.minShutter());
+  put(record.max_shutter, exif.maxShutter());
+  put(record.aperture, exif.aperture());
+  put(record.focus_distance, exif.focusDistance());
+  put(record.bps, exif.bps());
+  put(record.white_balance, exif.whiteBalance());
+  put(record.white_balance_index, exif.whiteBalanceIndex());
+  put(record.light_source, exif.lightSource());
+  put(record.metering_mode, exif.meteringMode());
+  put(record.camera_maker, exif.cameraMaker());
+  put(record.camera_name, exif.cameraName());
+  put(record.camera_model, exif.cameraModel());
+  put(record.lens_maker, exif.lensMaker());
+  put(record.lens_pretty_name, exif.lensPrettyName());
+  put(record.date, exif.date());
+  put(record.raw, exif.isRaw());
+  put(record.full_filled, exif.isFullFilled());
+  put(record.version, exif.version());
+  storeInfoFromDBExivAttributes(attributes);
 }
 
 std::shared_ptr<KRDBImage> KRDBImageExivAttributes::image() {

@@ -35,6 +35,7 @@ extern const char* const kKRDBImageExivAttributesDidChangeRaw;
 extern const char* const kKRDBImageExivAttributesDidChangeFullFilled;
 
 class KRDBImage;
+class KRDBExifReader;
 
 // The camera (exif) data of one image, over a dbcore::DBExivImgAttrib record. Its values are cached from the
 // record by its store hook; it points back weakly at its image (the image holds it). Used on its context's
@@ -104,6 +105,11 @@ class KRDBImageExivAttributes
   void setFullFilled(bool fullFilled);
   int32_t version() const { return version_; }
   void setVersion(int32_t version);
+
+  // Takes every camera value of the reader straight into the held record (with the record conversions of
+  // the setters) and reloads the cached values from it: for attributes about to be written for the first
+  // time, so nothing is posted and the entity is not marked changed. A nil reader changes nothing.
+  void updateByExifReader(const std::shared_ptr<KRDBExifReader>& reader);
 
   // Drops the back reference and the base's cached relations.
   void reset() override;

@@ -71,9 +71,10 @@ bool DBReactor::RenamePath(std::wstring const& oldPath, std::wstring const& newP
 void DBReactor::RebindPathImages(std::vector<std::pair<long long, std::shared_ptr<DBImage>>> const& pairs) {
   for (const auto& pair : pairs) DBReactorSupport::requireRecord(pair.second);
   DBConnection& db = connection();
-  db.transaction([&] {
-    for (const auto& [pathId, image] : pairs) DBLinks::setFolder(db, image->id(), pathId);
-  });
+  std::vector<std::pair<int64_t, int64_t>> links;
+  links.reserve(pairs.size());
+  for (const auto& [pathId, image] : pairs) links.emplace_back(image->id(), pathId);
+  db.transaction([&] { DBLinks::setFolders(db, links); });
 }
 
 }  // namespace dbcore

@@ -22,18 +22,29 @@ void DBReactor::writeOne(T& record) {
   }
 }
 
+// A tree record's write takes several statements and a transaction; any other record's write is one
+// statement (DBRecordIO::write), atomic by itself.
+template <class T>
+void DBReactor::writeAtomically(T& record) {
+  if constexpr (std::is_same_v<T, DBFilter> || std::is_same_v<T, DBRefFolder> ||
+                std::is_same_v<T, DBSmartFilter>) {
+    connection().transaction([&] { writeOne(record); });
+  } else {
+    connection().singleChange([&] { writeOne(record); });
+  }
+}
+
 template <DBWritableRecord T>
 DBReactor& DBReactor::operator<<(std::shared_ptr<T> const& record) {
   DBReactorSupport::requireRecord(record);
-  connection().transaction([&] { writeOne(*record); });
+  writeAtomically(*record);
   return *this;
 }
 
 template <>
 DBReactor& DBReactor::operator<< <DBEntity>(std::shared_ptr<DBEntity> const& record) {
   DBReactorSupport::requireRecord(record);
-  connection().transaction(
-      [&] { DBRecordVisitor::visit(*record, [this](auto& concrete) { writeOne(concrete); }); });
+  DBRecordVisitor::visit(*record, [this](auto& concrete) { writeAtomically(concrete); });
   return *this;
 }
 
@@ -72,9 +83,10 @@ DBReactor& DBReactor::operator<< <DBPath, DBImage>(
     if (!image->is_saved() || (path && !path->is_saved()))
       throw DBException("A folder link names an unsaved record");
   }
-  db.transaction([&] {
-    for (const auto& [path, image] : pairs) DBLinks::setFolder(db, image->id(), path ? path->id() : 0);
-  });
+  std::vector<std::pair<int64_t, int64_t>> links;
+  links.reserve(pairs.size());
+  for (const auto& [path, image] : pairs) links.emplace_back(image->id(), path ? path->id() : 0);
+  db.transaction([&] { DBLinks::setFolders(db, links); });
   return *this;
 }
 

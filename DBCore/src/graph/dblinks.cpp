@@ -1,5 +1,8 @@
 #include "dblinks.hpp"
 
+#include <algorithm>
+#include <unordered_map>
+
 #include "dbstrings.hpp"
 
 namespace dbcore {
@@ -32,17 +35,60 @@ void runForMember(DBConnection& connection, const DBStaticSql& sql, int64_t owne
   connection.prepare(sql)->bind(1, ownerId).bind(2, imageId).execute();
 }
 
+// The folder links of one statement: at most this many images.
+constexpr size_t kFoldersPerStatement = 256;
+
+// "UPDATE images SET folder_path_id = CASE _id_int_64 WHEN ?1 THEN ?2 ... END WHERE _id_int_64 IN (?1, ...)"
+// for `count` (image, folder) parameter pairs.
+std::string setFoldersSql(size_t count) {
+  std::string cases;
+  std::string images;
+  for (size_t index = 0; index < count; ++index) {
+    const std::string image = "?" + std::to_string(2 * index + 1);
+    cases += " WHEN " + image + " THEN ?" + std::to_string(2 * index + 2);
+    images += (index == 0 ? "" : ",") + image;
+  }
+  return "UPDATE images SET folder_path_id = CASE _id_int_64" + cases + " END WHERE _id_int_64 IN (" +
+         images + ")";
+}
+
+// The pairs with one pair per image, the image's last one, in the order of those last pairs.
+std::vector<std::pair<int64_t, int64_t>> lastFolderOfEachImage(
+    const std::vector<std::pair<int64_t, int64_t>>& pairs) {
+  std::unordered_map<int64_t, size_t> last;
+  for (size_t index = 0; index < pairs.size(); ++index) last[pairs[index].first] = index;
+  std::vector<std::pair<int64_t, int64_t>> unique;
+  unique.reserve(last.size());
+  for (size_t index = 0; index < pairs.size(); ++index) {
+    if (last[pairs[index].first] == index) unique.push_back(pairs[index]);
+  }
+  return unique;
+}
+
 }  // namespace
 
 void DBLinks::setFolder(DBConnection& connection, int64_t imageId, int64_t pathId) {
-  static const DBStaticSql kSql("UPDATE images SET folder_path_id = ? WHERE _id_int_64 = ?");
-  const DBStatementLease statement = connection.prepare(kSql);
-  if (pathId > 0) {
-    statement->bind(1, pathId);
-  } else {
-    statement->bindNull(1);
+  setFolders(connection, {{imageId, pathId}});
+}
+
+void DBLinks::setFolders(DBConnection& connection,
+                         const std::vector<std::pair<int64_t, int64_t>>& imageFolders) {
+  const std::vector<std::pair<int64_t, int64_t>> links = lastFolderOfEachImage(imageFolders);
+  for (size_t start = 0; start < links.size(); start += kFoldersPerStatement) {
+    const size_t count = std::min(kFoldersPerStatement, links.size() - start);
+    const DBStatementLease statement = connection.prepare(setFoldersSql(count));
+    for (size_t index = 0; index < count; ++index) {
+      const auto [imageId, pathId] = links[start + index];
+      const int parameter = static_cast<int>(2 * index + 1);
+      statement->bind(parameter, imageId);
+      if (pathId > 0) {
+        statement->bind(parameter + 1, pathId);
+      } else {
+        statement->bindNull(parameter + 1);
+      }
+    }
+    statement->execute();
   }
-  statement->bind(2, imageId).execute();
 }
 
 void DBLinks::addMember(DBConnection& connection, const char* table, int64_t ownerId, int64_t imageId) {

@@ -4,6 +4,8 @@
 #include <map>
 #include <set>
 #include <string>
+#include <utility>
+#include <vector>
 
 #include "dbconnection.hpp"
 #include "dbentity.hpp"
@@ -20,6 +22,10 @@ class DBLinks {
 
   // Sets the folder of an image; 0 unbinds it.
   static void setFolder(DBConnection& connection, int64_t imageId, int64_t pathId);
+  // Sets the folders of many images, (image id, folder id) pairs, a later pair of an image winning. Few
+  // statements: inside a savepoint each statement that checks a foreign key costs a statement journal.
+  static void setFolders(DBConnection& connection,
+                         const std::vector<std::pair<int64_t, int64_t>>& imageFolders);
   static void addMember(DBConnection& connection, const char* table, int64_t ownerId, int64_t imageId);
   static void removeMember(DBConnection& connection, const char* table, int64_t ownerId, int64_t imageId);
   // Folder id -> image ids, or image id -> folder ids when byImage is true.

@@ -204,6 +204,8 @@ class DBReactor {
   std::shared_ptr<A> attributesOfImage(const std::shared_ptr<DBImage>& image) const;
   template <class T>
   void writeOne(T& record);
+  template <class T>
+  void writeAtomically(T& record);
   void writeBinding(DBRefFolder& folder, long long parentId, const std::shared_ptr<DBPath>& path);
   void writeTreeNode(const DBRefFolderNode& node, long long parentId);
   template <class T>

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -64,14 +65,18 @@ class DBRecordIO {
     return readOne<T>(*statement);
   }
 
-  // Inserts an unsaved record (assigning its id) or replaces the stored values of a saved one (inserting
-  // it again under its id when its row is gone). Inserts and updates are separate statements: an upsert
-  // that may rewrite foreign and unique keys makes SQLite journal every page the statement touches.
+  // Inserts an unsaved record (assigning its id) or writes the stored values of a saved one (inserting it
+  // again under its id when its row is gone). A saved record's row is read first and only the columns
+  // whose values differ are assigned: every assigned column costs the upkeep of its indexes (attribute
+  // tables index most of their columns), and a link to an owner record left unassigned spares SQLite a
+  // foreign-key check. Either way one statement changes the row, so a write is atomic on its own.
   template <class T>
   static void write(DBConnection& connection, T& record) {
     if (record.is_saved()) {
-      writeColumns(*connection.prepare(updateSql<T>()), record);
-      if (connection.changes() > 0) return;
+      if (const auto changed = changedColumns(connection, record)) {
+        if (*changed != 0) updateColumns(connection, record, *changed);
+        return;
+      }
     }
     writeColumns(*connection.prepare(insertSql<T>()), record);
     if (!record.is_saved()) record.set_id(connection.lastInsertRowId());
@@ -111,20 +116,46 @@ class DBRecordIO {
     return sql;
   }
 
-  // Parameters numbered as in insertSql(): the id is ?1.
+  // The columns (bit i for column i of T::all_columns(), never the id) whose stored values differ from the
+  // record's; nothing when the record's row is gone.
   template <class T>
-  static const DBStaticSql& updateSql() {
-    static const DBStaticSql sql([] {
-      std::string assignments;
-      int index = 0;
-      for (const auto& column : T::all_columns()) {
-        ++index;
-        if (index > 1) assignments += std::string(column.name) + "=?" + std::to_string(index) + ",";
+  static std::optional<uint64_t> changedColumns(DBConnection& connection, const T& record) {
+    if (T::all_columns().size() > 64)
+      throw DBException(std::string("Too many columns to compare in ") + T::kTableName);
+    static const DBStaticSql kSql(selectSql<T>() + " WHERE " + kIdColumn + " = ?");
+    const DBStatementLease statement = connection.prepare(kSql);
+    statement->bind(1, record.id());
+    if (!statement->step()) return std::nullopt;
+    uint64_t changed = 0;
+    int index = 0;
+    for (const auto& column : T::all_columns()) {
+      if (index > 0 && !(statement->column(index, column.type) == column.get(record)))
+        changed |= uint64_t{1} << index;
+      ++index;
+    }
+    return changed;
+  }
+
+  // Assigns the given columns of the record's row; parameters numbered as in insertSql() (the id is ?1).
+  template <class T>
+  static void updateColumns(DBConnection& connection, const T& record, uint64_t columns) {
+    std::string assignments;
+    int index = 0;
+    for (const auto& column : T::all_columns()) {
+      if ((columns >> index & 1) != 0) {
+        assignments +=
+            std::string(assignments.empty() ? "" : ",") + column.name + "=?" + std::to_string(index + 1);
       }
-      assignments.pop_back();
-      return std::string("UPDATE ") + T::kTableName + " SET " + assignments + " WHERE " + kIdColumn + "=?1";
-    }());
-    return sql;
+      ++index;
+    }
+    const DBStatementLease statement = connection.prepare(std::string("UPDATE ") + T::kTableName + " SET " +
+                                                          assignments + " WHERE " + kIdColumn + "=?1");
+    index = 0;
+    for (const auto& column : T::all_columns()) {
+      if (index == 0 || (columns >> index & 1) != 0) column.bind(*statement, index + 1, record);
+      ++index;
+    }
+    statement->execute();
   }
 };
 

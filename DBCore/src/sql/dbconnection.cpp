@@ -75,6 +75,11 @@ DBStatementLease DBConnection::prepare(const std::string& sql) {
   return DBStatementLease(statements_.statement(sql));
 }
 
+void DBConnection::singleChange(const std::function<void()>& body) {
+  if (inTransaction()) return body();
+  transaction(body);
+}
+
 void DBConnection::transaction(const std::function<void()>& body) {
   // SQLite rolls a whole transaction back on some errors (a full disk, say): a savepoint opened then
   // would start a transaction of its own and commit apart from the one it was meant to join.

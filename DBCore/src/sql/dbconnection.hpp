@@ -45,6 +45,10 @@ class DBConnection {
   // transaction the body simply joins it. Throws DBException, after rolling back, when the commit fails.
   void commitTogether(const std::function<void()>& body);
   bool inTransaction() const { return transactionDepth_ > 0; }
+  // Runs a body that changes the database with at most one statement: in a transaction of its own when
+  // none is open; inside an open one directly, since the statement is atomic by itself (a savepoint per
+  // record would cost more than the record's write).
+  void singleChange(const std::function<void()>& body);
 
   int64_t lastInsertRowId() const { return sqlite3_last_insert_rowid(db_); }
   int changes() const { return sqlite3_changes(db_); }

@@ -1,6 +1,7 @@
 #include "dbrecordio.hpp"
 
 #include <gtest/gtest.h>
+#include <sqlite3.h>
 
 #include <memory>
 #include <string>
@@ -129,4 +130,64 @@ TEST_F(DBRecordIOTest, ReadAllReadsEveryRowAndANewLeaseStartsAgain) {
   const std::vector<long long> expected{saved(path(L"a"))->id(), saved(path(L"b"))->id()};
   EXPECT_EQ(ids(DBRecordIO::readAll<DBPath>(*pathsInIdOrder())), expected);
   EXPECT_EQ(ids(DBRecordIO::readAll<DBPath>(*pathsInIdOrder())), expected);
+}
+
+namespace {
+
+// Collects the text of every statement the connection starts, as SQLite expands it before running it.
+int recordStatement(unsigned /*type*/, void* context, void* statement, void* /*unused*/) {
+  const char* sql = sqlite3_sql(static_cast<sqlite3_stmt*>(statement));
+  if (sql) static_cast<std::vector<std::string>*>(context)->emplace_back(sql);
+  return 0;
+}
+
+class DBRecordIOUpdateTest : public DBCatalogTestBase {
+ protected:
+  DBUserImgAttrib savedAttributes() {
+    DBImage image;
+    DBRecordIO::write(*connection, image);
+    DBUserImgAttrib attributes;
+    attributes.image_id = image.id();
+    DBRecordIO::write(*connection, attributes);
+    return attributes;
+  }
+
+  // The statements that writing the record runs.
+  std::vector<std::string> statementsOfWrite(DBUserImgAttrib& attributes) {
+    std::vector<std::string> statements;
+    sqlite3_trace_v2(connection->handle(), SQLITE_TRACE_STMT, recordStatement, &statements);
+    DBRecordIO::write(*connection, attributes);
+    sqlite3_trace_v2(connection->handle(), 0, nullptr, nullptr);
+    return statements;
+  }
+};
+
+}  // namespace
+
+TEST_F(DBRecordIOUpdateTest, AnUnchangedRecordOnlyReadsItsRow) {
+  DBUserImgAttrib attributes = savedAttributes();
+  const std::vector<std::string> statements = statementsOfWrite(attributes);
+  ASSERT_EQ(statements.size(), 1u);
+  EXPECT_EQ(statements[0].rfind("SELECT ", 0), 0u);
+}
+
+TEST_F(DBRecordIOUpdateTest, OnlyTheChangedColumnsAreAssigned) {
+  DBUserImgAttrib attributes = savedAttributes();
+  attributes.rating = 4;
+  attributes.lost = true;
+  const std::vector<std::string> statements = statementsOfWrite(attributes);
+  ASSERT_EQ(statements.size(), 2u);
+  EXPECT_EQ(statements[1], "UPDATE image_user_attributes SET rating=?7,lost_bool=?12 WHERE _id_int_64=?1");
+  const auto read = DBRecordIO::get<DBUserImgAttrib>(*connection, attributes.id());
+  ASSERT_TRUE(read);
+  EXPECT_EQ(read->column_values(), attributes.column_values());
+}
+
+TEST_F(DBRecordIOUpdateTest, AChangedLinkToTheOwnerIsWrittenToo) {
+  DBUserImgAttrib attributes = savedAttributes();
+  DBImage other;
+  DBRecordIO::write(*connection, other);
+  attributes.image_id = other.id();
+  DBRecordIO::write(*connection, attributes);
+  EXPECT_EQ(DBRecordIO::get<DBUserImgAttrib>(*connection, attributes.id())->image_id, other.id());
 }

@@ -206,3 +206,31 @@ TEST_F(DBConnectionTest, OpeningAFileThatIsNotADatabaseThrows) {
     EXPECT_EQ(exception.code(), SQLITE_NOTADB) << exception.what();
   }
 }
+
+namespace {
+
+int countSavepoint(unsigned /*type*/, void* context, void* statement, void* /*unused*/) {
+  const char* sql = sqlite3_sql(static_cast<sqlite3_stmt*>(statement));
+  if (sql && std::string(sql).rfind("SAVEPOINT", 0) == 0) ++*static_cast<int*>(context);
+  return 0;
+}
+
+}  // namespace
+
+TEST_F(DBConnectionTest, ASingleChangeOutsideATransactionGetsOneOfItsOwn) {
+  bool inTransaction = false;
+  connection->singleChange([&] { inTransaction = connection->inTransaction(); });
+  EXPECT_TRUE(inTransaction);
+  EXPECT_FALSE(connection->inTransaction());
+}
+
+TEST_F(DBConnectionTest, ASingleChangeInsideATransactionTakesNoSavepoint) {
+  int savepoints = 0;
+  sqlite3_trace_v2(connection->handle(), SQLITE_TRACE_STMT, countSavepoint, &savepoints);
+  connection->transaction([&] {
+    connection->singleChange([&] { connection->exec("CREATE TABLE t(x)"); });
+    connection->transaction([] {});
+  });
+  sqlite3_trace_v2(connection->handle(), 0, nullptr, nullptr);
+  EXPECT_EQ(savepoints, 1);
+}

@@ -102,18 +102,9 @@ constexpr const char* kImageInsert =
     "INSERT INTO images(marked_to_delete_bool, guid_wide_ch, path_wide_ch, width, height, file_size_int_64, "
     "modification_date_int_64, import_date_int_64, import_index, creation_date_int_64, folder_path_id) "
     "VALUES (0, ?1, ?2, ?3, ?4, ?5, ?6, ?7, ?8, ?9, ?10)";
-constexpr const char* kUserInsert =
-    "INSERT INTO image_user_attributes(marked_to_delete_bool, image_id_int_64, trash_bool, marker, color, "
-    "rating, edit_date_int_64, opened_bool, trashed_date_int_64, origin_path_wide_ch, lost_bool, tutorial) "
-    "VALUES (0, ?1, 0, 0, 0, 0, 0, 0, 0, '', 0, 0)";
-constexpr const char* kExifInsert =
-    "INSERT INTO image_exiv_attributes(marked_to_delete_bool, image_id_int_64, iso_speed, shutter_speed, "
-    "number, "
-    "focal_len, focal_len35mm, ev, focal_len_min, focal_len_max, shutter_min, shutter_max, aperture, "
-    "focus_distance, bits_per_sample, white_balance, white_balance_index, light_source, metering_mode, "
-    "camera_maker_wide_ch, camera_name_wide_ch, camera_model_wide_ch, lens_maker_wide_ch, "
-    "lens_pretty_name_wide_ch, date_time_int_64, is_raw_bool, is_full_filled_bool, version) "
-    "VALUES (0, ?1, ?2, 0, ?3, ?4, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, '', '', ?5, '', '', ?6, ?7, 0, 0)";
+const std::string kUserInsert = KRBenchSqlite::userAttributesInsert("0, ?1, 0, 0, 0, 0, 0, 0, 0, '', 0, 0");
+const std::string kExifInsert = KRBenchSqlite::exifAttributesInsert(
+    "0, ?1, ?2, 0, ?3, ?4, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, '', '', ?5, '', '', ?6, ?7, 0, 0");
 
 void bindImage(sqlite3_stmt* image, int i) {
   const BenchExifReader reader(i);
@@ -142,8 +133,8 @@ void bindExif(sqlite3_stmt* exif, sqlite3_int64 imageId, int i) {
 
 void rawCreate(sqlite3* db) {
   sqlite3_stmt* image = KRBenchSqlite::prepare(db, kImageInsert);
-  sqlite3_stmt* user = KRBenchSqlite::prepare(db, kUserInsert);
-  sqlite3_stmt* exif = KRBenchSqlite::prepare(db, kExifInsert);
+  sqlite3_stmt* user = KRBenchSqlite::prepare(db, kUserInsert.c_str());
+  sqlite3_stmt* exif = KRBenchSqlite::prepare(db, kExifInsert.c_str());
   sqlite3_exec(db, "BEGIN", nullptr, nullptr, nullptr);
   for (int i = 0; i < kImages; ++i) {
     bindImage(image, i);

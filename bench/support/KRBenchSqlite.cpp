@@ -33,3 +33,23 @@ double KRBenchSqlite::timed(const std::function<void()>& work) {
   work();
   return std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
 }
+
+std::string KRBenchSqlite::userAttributesInsert(const std::string& values) {
+  return "INSERT INTO image_user_attributes(marked_to_delete_bool, image_id_int_64, trash_bool, marker, "
+         "color, "
+         "rating, edit_date_int_64, opened_bool, trashed_date_int_64, origin_path_wide_ch, lost_bool, "
+         "tutorial) "
+         "VALUES (" +
+         values + ")";
+}
+
+std::string KRBenchSqlite::exifAttributesInsert(const std::string& values) {
+  return "INSERT INTO image_exiv_attributes(marked_to_delete_bool, image_id_int_64, iso_speed, "
+         "shutter_speed, "
+         "number, focal_len, focal_len35mm, ev, focal_len_min, focal_len_max, shutter_min, shutter_max, "
+         "aperture, "
+         "focus_distance, bits_per_sample, white_balance, white_balance_index, light_source, metering_mode, "
+         "camera_maker_wide_ch, camera_name_wide_ch, camera_model_wide_ch, lens_maker_wide_ch, "
+         "lens_pretty_name_wide_ch, date_time_int_64, is_raw_bool, is_full_filled_bool, version) VALUES (" +
+         values + ")";
+}

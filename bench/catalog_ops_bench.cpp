@@ -98,10 +98,7 @@ double catalogCreation() {
   return best;
 }
 
-constexpr const char* kImageInsert =
-    "INSERT INTO images(marked_to_delete_bool, guid_wide_ch, path_wide_ch, width, height, file_size_int_64, "
-    "modification_date_int_64, import_date_int_64, import_index, creation_date_int_64, folder_path_id) "
-    "VALUES (0, ?1, ?2, ?3, ?4, ?5, ?6, ?7, ?8, ?9, ?10)";
+const std::string kImageInsert = KRBenchSqlite::imagesInsert("0, ?1, ?2, ?3, ?4, ?5, ?6, ?7, ?8, ?9, ?10");
 const std::string kUserInsert = KRBenchSqlite::userAttributesInsert("0, ?1, 0, 0, 0, 0, 0, 0, 0, '', 0, 0");
 const std::string kExifInsert = KRBenchSqlite::exifAttributesInsert(
     "0, ?1, ?2, 0, ?3, ?4, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, '', '', ?5, '', '', ?6, ?7, 0, 0");
@@ -132,7 +129,7 @@ void bindExif(sqlite3_stmt* exif, sqlite3_int64 imageId, int i) {
 }
 
 void rawCreate(sqlite3* db) {
-  sqlite3_stmt* image = KRBenchSqlite::prepare(db, kImageInsert);
+  sqlite3_stmt* image = KRBenchSqlite::prepare(db, kImageInsert.c_str());
   sqlite3_stmt* user = KRBenchSqlite::prepare(db, kUserInsert.c_str());
   sqlite3_stmt* exif = KRBenchSqlite::prepare(db, kExifInsert.c_str());
   sqlite3_exec(db, "BEGIN", nullptr, nullptr, nullptr);

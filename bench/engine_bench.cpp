@@ -71,10 +71,7 @@ void importThroughEngine(const std::string& path) {
 
 // Every column of the three record tables, as a hand-written importer would insert them: the values the
 // benchmark sets, and zeros or empty texts for the rest.
-constexpr const char* kImageInsert =
-    "INSERT INTO images(marked_to_delete_bool, guid_wide_ch, path_wide_ch, width, height, file_size_int_64, "
-    "modification_date_int_64, import_date_int_64, import_index, creation_date_int_64, folder_path_id) "
-    "VALUES (0, '', ?1, 0, 0, 0, 0, 0, ?2, 0, ?3)";
+const std::string kImageInsert = KRBenchSqlite::imagesInsert("0, '', ?1, 0, 0, 0, 0, 0, ?2, 0, ?3");
 const std::string kUserInsert = KRBenchSqlite::userAttributesInsert("0, ?1, 0, 0, 0, ?2, 0, 0, 0, '', 0, 0");
 const std::string kExifInsert = KRBenchSqlite::exifAttributesInsert(
     "0, ?1, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, '', '', ?2, '', '', 0, 0, 0, 0");
@@ -90,7 +87,7 @@ void importThroughRawSqlite(const std::string& path, int imageCount) {
     KRBenchSqlite::bindText(folder, 1, "/Photos/Folder " + std::to_string(f));
     KRBenchSqlite::execute(folder);
   }
-  sqlite3_stmt* image = KRBenchSqlite::prepare(db, kImageInsert);
+  sqlite3_stmt* image = KRBenchSqlite::prepare(db, kImageInsert.c_str());
   sqlite3_stmt* user = KRBenchSqlite::prepare(db, kUserInsert.c_str());
   sqlite3_stmt* exif = KRBenchSqlite::prepare(db, kExifInsert.c_str());
   for (int i = 0; i < imageCount; ++i) {

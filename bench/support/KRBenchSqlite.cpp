@@ -34,6 +34,14 @@ double KRBenchSqlite::timed(const std::function<void()>& work) {
   return std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
 }
 
+std::string KRBenchSqlite::imagesInsert(const std::string& values) {
+  return "INSERT INTO images(marked_to_delete_bool, guid_wide_ch, path_wide_ch, width, height, "
+         "file_size_int_64, "
+         "modification_date_int_64, import_date_int_64, import_index, creation_date_int_64, folder_path_id) "
+         "VALUES (" +
+         values + ")";
+}
+
 std::string KRBenchSqlite::userAttributesInsert(const std::string& values) {
   return "INSERT INTO image_user_attributes(marked_to_delete_bool, image_id_int_64, trash_bool, marker, "
          "color, "

@@ -16,8 +16,9 @@ class KRBenchSqlite {
   // The attribute rows of the benchmarks' catalogs for image number `i`: rating i % 6 and camera model
   // "X-T" + i % 5. `user` and `exif` insert (image id, rating) and (image id, camera model).
   static void insertAttributes(sqlite3_stmt* user, sqlite3_stmt* exif, sqlite3_int64 imageId, int i);
-  // Inserts of every column of the attribute tables, with the given VALUES list (in column order: the
-  // marked-to-delete flag, the image id, then the table's own columns).
+  // Inserts of every column of the image and attribute tables, with the given VALUES list in column order
+  // (the marked-to-delete flag first; for attributes the image id next).
+  static std::string imagesInsert(const std::string& values);
   static std::string userAttributesInsert(const std::string& values);
   static std::string exifAttributesInsert(const std::string& values);
   // Seconds the work takes.

@@ -3,6 +3,7 @@
 #include <atomic>
 #include <cstdint>
 #include <functional>
+#include <map>
 #include <memory>
 #include <mutex>
 #include <vector>
@@ -11,13 +12,19 @@
 #include "KRClasses/KRBlockDispatcher.hpp"
 #include "KRFoundation/KRError.hpp"
 #include "Model/KRDBEntity/KRDBDataStorageCreating.hpp"
+#include "Model/KRDBEntity/KRDBEntityContext.hpp"
 #include "Model/KRDBEntity/KRDBEntityID.hpp"
 
 namespace dbcore {
 class DBReactor;
 }
 class KRDBEntity;
+class KRDBAbstractBaseFolder;
+class KRDBEntityFavoriteAlias;
 class KRDBImage;
+class KRDBImageState;
+class KRDBPath;
+class KRDBVolume;
 class KRDBImageAttributes;
 class KRDBImageExivAttributes;
 class KRDBCollection;
@@ -144,6 +151,125 @@ class KRDBCatalog : public KRAbstractModel {
   // Attaches the folder's attributes; answers the linked entities attached (empty or the attributes).
   KRDBEntityArray additionalFetchingForFilter(const std::shared_ptr<KRDBCollection>& filter);
   KRDBEntityArray additionalFetchingForSmartFilter(const std::shared_ptr<KRDBSmartFilter>& filter);
+
+  // ---- Relations (KRDBCatalogRelations.cpp): trees, members, history states, folders, volumes, attributes
+  // and favorite aliases. The Sync forms run on the queue; the forms with a handler follow the operation
+  // pattern; the forms without one wait for the result (nil or empty once operations are disallowed). The
+  // forms without a Sync form or handler queue their write and return at once (nothing once disallowed).
+  template <class Result>
+  using ResultHandler = std::function<void(Result)>;
+  using FolderPtr = std::shared_ptr<KRDBAbstractBaseFolder>;
+  // Current states by image id.
+  using ImageStatesByID = std::map<int64_t, std::shared_ptr<KRDBImageState>>;
+
+  // The children of a collection, referenced folder or smart filter (these last two linked to their parent);
+  // empty for another entity or when the engine fails.
+  KRDBEntitySet fetchChildsOfFilterSync(const std::shared_ptr<KRDBEntity>& filter);
+  void fetchChildsOfFilter(const std::shared_ptr<KRDBEntity>& filter, ResultHandler<KRDBEntitySet> handler,
+                           bool sync);
+  KRDBEntitySet fetchChildsOfFilter(const std::shared_ptr<KRDBEntity>& filter);
+  // Every level below a collection or referenced folder; a smart filter's children.
+  KRDBEntitySet fetchDescendantsOfFilterSync(const std::shared_ptr<KRDBEntity>& filter);
+  void fetchDescendantsOfFilter(const std::shared_ptr<KRDBEntity>& filter,
+                                ResultHandler<KRDBEntitySet> handler, bool sync);
+  // The parent of a collection or referenced folder; nil for the root and other entities.
+  FolderPtr fetchParentOfFilterSync(const std::shared_ptr<KRDBEntity>& filter);
+  void fetchParentOfFilter(const std::shared_ptr<KRDBEntity>& filter, ResultHandler<FolderPtr> handler,
+                           bool sync);
+  FolderPtr fetchParentOfFilter(const std::shared_ptr<KRDBEntity>& filter);
+  // Moves the given folders that are not children yet under a collection or referenced folder, in one commit.
+  void addChildsSync(const KRDBEntitySet& childs, const std::shared_ptr<KRDBEntity>& filter);
+  void addChilds(const KRDBEntitySet& childs, const std::shared_ptr<KRDBEntity>& filter, Handler handler,
+                 bool sync);
+
+  // The images of a collection, referenced folder (at or under its path) or smart filter (its conditions),
+  // not marked to delete, by id.
+  KRDBEntityArray fetchImagesOfFilterSync(const std::shared_ptr<KRDBEntity>& filter);
+  void fetchImagesOfFilter(const std::shared_ptr<KRDBEntity>& filter, ResultHandler<KRDBEntityArray> handler,
+                           bool sync);
+  KRDBEntityArray fetchImagesOfFilter(const std::shared_ptr<KRDBEntity>& filter);
+  // Adds the images not yet members to a collection or referenced folder, in one commit.
+  void addImagesSync(const KRDBEntitySet& images, const std::shared_ptr<KRDBEntity>& filter);
+  void addImages(const KRDBEntitySet& images, const std::shared_ptr<KRDBEntity>& filter, Handler handler,
+                 bool sync);
+  // Removes the images that are members from a collection, in one commit.
+  void deleteImagesSync(const KRDBEntitySet& images, const std::shared_ptr<KRDBEntity>& filter);
+  void deleteImages(const KRDBEntitySet& images, const std::shared_ptr<KRDBEntity>& filter, Handler handler,
+                    bool sync);
+  // The collections that hold the image.
+  KRDBEntitySet fetchFiltersOfImageSync(const std::shared_ptr<KRDBImage>& image);
+  void fetchFiltersOfImage(const std::shared_ptr<KRDBImage>& image, ResultHandler<KRDBEntitySet> handler,
+                           bool sync);
+  KRDBEntitySet fetchFiltersOfImage(const std::shared_ptr<KRDBImage>& image);
+
+  // ---- History states
+  KRDBImageStates fetchStatesOfImageSync(const std::shared_ptr<KRDBImage>& image);
+  void fetchStatesOfImage(const std::shared_ptr<KRDBImage>& image, ResultHandler<KRDBImageStates> handler,
+                          bool sync);
+  KRDBImageStates fetchStatesOfImage(const std::shared_ptr<KRDBImage>& image);
+  std::shared_ptr<KRDBImageState> fetchStateForImageSync(const std::shared_ptr<KRDBImage>& image);
+  void fetchCurrentStateForImage(const std::shared_ptr<KRDBImage>& image,
+                                 ResultHandler<std::shared_ptr<KRDBImageState>> handler, bool sync);
+  std::shared_ptr<KRDBImageState> fetchCurrentStateForImage(const std::shared_ptr<KRDBImage>& image);
+  void fetchCurrentStatesForImages(const KRDBEntityArray& images, ResultHandler<ImageStatesByID> handler,
+                                   bool sync);
+  // Each image gets its states in order and the position of its current one among them (-1 when it is not
+  // one of them), all in one write.
+  void setStates(const KRDBImageStates& states, const std::shared_ptr<KRDBImageState>& currentState,
+                 const std::shared_ptr<KRDBImage>& image);
+  void setStatesArray(const std::vector<KRDBImageStates>& statesArray,
+                      const KRDBImageStates& currentStatesArray, const KRDBEntityArray& imagesArray);
+  void setCurrentState(const std::shared_ptr<KRDBImageState>& state, const std::shared_ptr<KRDBImage>& image);
+
+  // ---- Favorite aliases. An entity without one gets one, and *created (when given) is set to true.
+  std::shared_ptr<KRDBEntityFavoriteAlias> fetchFavoriteAliasForEntitySync(
+      const std::shared_ptr<KRDBEntity>& entity, bool* created);
+  void fetchFavoritealiasForEntity(const std::shared_ptr<KRDBEntity>& entity, bool* created,
+                                   ResultHandler<std::shared_ptr<KRDBEntityFavoriteAlias>> handler,
+                                   bool sync);
+  std::shared_ptr<KRDBEntityFavoriteAlias> fetchFavoriteAliasForEntity(
+      const std::shared_ptr<KRDBEntity>& entity, bool* created);
+
+  // ---- Folders and volumes
+  std::shared_ptr<KRDBVolume> fetchVolumeForPathSync(const std::shared_ptr<KRDBPath>& path);
+  void fetchVolumeForPath(const std::shared_ptr<KRDBPath>& path,
+                          ResultHandler<std::shared_ptr<KRDBVolume>> handler, bool sync);
+  std::shared_ptr<KRDBVolume> fetchVolumeForPath(const std::shared_ptr<KRDBPath>& path);
+  void setVolume(const std::shared_ptr<KRDBVolume>& volume, const std::shared_ptr<KRDBPath>& path);
+  // Renames the folder path (and the paths below it) from one volume to another; the completion gets the
+  // outcome on the main thread (false when the engine failed).
+  void renamePath(const KRString& path, const std::shared_ptr<KRDBVolume>& volume, const KRString& newPath,
+                  const std::shared_ptr<KRDBVolume>& newVolume, std::function<void(bool)> completion);
+  // Puts the images, in order, into the folder in one write; the rebinding replaces their folder.
+  void bindFolderDBPath(const std::shared_ptr<KRDBPath>& path, const KRDBEntityArray& images);
+  void rebindFolderDBPath(const std::shared_ptr<KRDBPath>& path, const KRDBEntityArray& images);
+  std::shared_ptr<KRDBPath> fetchDBPathForImageSync(const std::shared_ptr<KRDBImage>& image);
+  std::shared_ptr<KRDBPath> fetchPathForReferencedFolderSync(
+      const std::shared_ptr<KRDBReferencedFolder>& folder);
+  void fetchPathForReferencedFolder(const std::shared_ptr<KRDBReferencedFolder>& folder,
+                                    ResultHandler<std::shared_ptr<KRDBPath>> handler, bool sync);
+  std::shared_ptr<KRDBPath> fetchPathForReferencedFolder(const std::shared_ptr<KRDBReferencedFolder>& folder);
+
+  // ---- An image's attribute records and the other way round (the Sync fetches of the attributes are above)
+  void fetchAttributesForImage(const std::shared_ptr<KRDBImage>& image,
+                               ResultHandler<std::shared_ptr<KRDBImageAttributes>> handler, bool sync);
+  std::shared_ptr<KRDBImageAttributes> fetchAttributesForImage(const std::shared_ptr<KRDBImage>& image);
+  std::shared_ptr<KRDBImage> fetchImageForAttributesSync(
+      const std::shared_ptr<KRDBImageAttributes>& attributes);
+  void fetchImageForAttributes(const std::shared_ptr<KRDBImageAttributes>& attributes,
+                               ResultHandler<std::shared_ptr<KRDBImage>> handler, bool sync);
+  std::shared_ptr<KRDBImage> fetchImageForAttributes(const std::shared_ptr<KRDBImageAttributes>& attributes);
+  void fetchExivAttributesForImage(const std::shared_ptr<KRDBImage>& image,
+                                   ResultHandler<std::shared_ptr<KRDBImageExivAttributes>> handler,
+                                   bool sync);
+  std::shared_ptr<KRDBImageExivAttributes> fetchExivAttributesForImage(
+      const std::shared_ptr<KRDBImage>& image);
+  std::shared_ptr<KRDBImage> fetchImageForExivAttributesSync(
+      const std::shared_ptr<KRDBImageExivAttributes>& attributes);
+  void fetchImageForExivAttributes(const std::shared_ptr<KRDBImageExivAttributes>& attributes,
+                                   ResultHandler<std::shared_ptr<KRDBImage>> handler, bool sync);
+  std::shared_ptr<KRDBImage> fetchImageForExivAttributes(
+      const std::shared_ptr<KRDBImageExivAttributes>& attributes);
 
   // ---- Fetch, update, deletion, dangling records (KRDBCatalogStorage.cpp)
   using StringsHandler = std::function<void(std::vector<KRString>)>;

@@ -7,7 +7,9 @@
 #include <set>
 #include <vector>
 
+#include "KRTestExifReader.hpp"
 #include "Model/KRDBCatalog/KRDBCatalog.hpp"
+#include "Model/KRDBEntity/KRDBEntity.hpp"
 #include "Model/KRDBEntity/KRDBEntityClasses.hpp"
 #include "Model/KRDBFilteredEntitiesFetchRequest/KRDBFilteredEntitiesFetchRequest.hpp"
 #include "dbreactor.hpp"
@@ -38,11 +40,27 @@ class KRFetchRequestCatalog {
                                    [&] { entities = catalog_->createEntitiesWithTypeSync(type, infos); });
     return entities;
   }
-  // Writes the entity's record with its marked-to-delete flag set.
+  // Images named IMG_<index>.JPG with their user and exif attribute records; with `withCamera`, the
+  // exif values of KRTestExifReader's camera.
+  KRDBEntityArray createImages(int count, bool withCamera = false) {
+    std::vector<KRDictionary> infos;
+    for (int index = 0; index < count; ++index) {
+      const std::string name = "IMG_" + std::to_string(index) + ".JPG";
+      infos.push_back({{"DBImageInfoExifReader",
+                        KRTestExifReader::make({"/p/" + name, 600, 400, 1000 + index,
+                                                KRDate::dateWithTimeIntervalSince1970(1600000000),
+                                                KRDate::dateWithTimeIntervalSince1970(1500000000)},
+                                               withCamera)},
+                       {"DBImageInfoImageName", name}});
+    }
+    return create(KRDBEntityTypeImage, infos);
+  }
+  // Writes the first record of the kind with its marked-to-delete flag set.
   template <class Record>
-  void markToDelete(const std::shared_ptr<KRDBEntity>& entity) {
-    const auto record = std::dynamic_pointer_cast<Record>(entity->dbentity());
-    ASSERT_TRUE(record);
+  void markFirstToDelete() {
+    const auto all = allRecords<Record>();
+    ASSERT_FALSE(all.empty());
+    const std::shared_ptr<dbcore::DBEntity> record = all.front();
     record->set_marked_to_delete(true);
     onEngine([&](const Reactor& reactor) { *reactor << record; });
   }

@@ -1,0 +1,291 @@
+#include "Model/KRDBFilteredImagesFetchRequest/KRDBFilteredImagesFetchRequest.hpp"
+
+#include <gtest/gtest.h>
+
+#include <map>
+
+#include "../KRDBFilteredEntitiesFetchRequest/KRFetchRequestCatalog.hpp"
+#include "KRServices/KRCapturingLogSink.hpp"
+#include "Model/KRDBCollection/KRDBCollection.hpp"
+#include "Model/KRDBImage/KRDBImage.hpp"
+#include "Model/KRDBImageAttributes/KRDBImageAttributes.hpp"
+#include "Model/KRDBImageExivAttributes/KRDBImageExivAttributes.hpp"
+#include "Model/KRDBPath/KRDBPath.hpp"
+#include "Model/KRDBReferencedFolder/KRDBReferencedFolder.hpp"
+#include "Model/KRDBVolume/KRDBVolume.hpp"
+#include "dbfilter.hpp"
+#include "dbimgselectquery.hpp"
+#include "dbreffolder.hpp"
+#include "dbvolume.hpp"
+
+namespace {
+
+using dbcore::DBExivImgAttrib;
+using dbcore::DBImage;
+using dbcore::DBUserImgAttrib;
+using Ids = KRFetchRequestCatalog::Ids;
+using Request = KRDBFilteredImagesFetchRequest;
+
+const KRString kImage = "imageCondition";
+const KRString kUser = "userAttributesCondition";
+const KRString kExiv = "exivAttributesCondition";
+
+template <class Entity, class Record>
+std::shared_ptr<Entity> entity(int64_t id, const std::function<void(Record&)>& fill = {}) {
+  auto record = std::make_shared<Record>();
+  record->set_id(id);
+  if (fill) fill(*record);
+  return Entity::initWithDBEntity(record);
+}
+
+std::shared_ptr<KRDBVolume> volume(int64_t id) { return entity<KRDBVolume, dbcore::DBVolume>(id); }
+
+std::shared_ptr<KRDBPath> path(int64_t id, const std::wstring& text,
+                               const std::shared_ptr<KRDBVolume>& volume) {
+  auto result = entity<KRDBPath, dbcore::DBPath>(id, [&](dbcore::DBPath& record) { record.path = text; });
+  result->setVolumePrimitive(volume);
+  return result;
+}
+
+std::shared_ptr<KRDBReferencedFolder> folder(const std::shared_ptr<KRDBPath>& path) {
+  auto result = entity<KRDBReferencedFolder, dbcore::DBRefFolder>(path ? path->entityID()->dbid() : 99);
+  result->setDbPath(path);
+  return result;
+}
+
+std::shared_ptr<KRDBCollection> collection(int64_t id, const KRDBEntitySet& images) {
+  auto result = entity<KRDBCollection, dbcore::DBFilter>(id);
+  result->setImagesPrimitive(std::make_shared<const KRDBEntitySet>(images));
+  return result;
+}
+
+// An image with its two attribute entities.
+std::shared_ptr<KRDBImage> image(int64_t id, const std::wstring& name) {
+  auto result = entity<KRDBImage, DBImage>(id, [&](DBImage& record) { record.path = name; });
+  result->setAttributesPrimitive(entity<KRDBImageAttributes, DBUserImgAttrib>(
+      id, [id](DBUserImgAttrib& record) { record.image_id = id; }));
+  result->setExivAttributesPrimitive(entity<KRDBImageExivAttributes, DBExivImgAttrib>(
+      id, [id](DBExivImgAttrib& record) { record.image_id = id; }));
+  return result;
+}
+
+std::string formatOf(const KRPredicatePtr& predicate) { return predicate->predicateFormat(); }
+
+class KRDBFilteredImagesFetchRequestTest : public testing::Test {
+ protected:
+  void SetUp() override { KRDBEntityClasses::registerAll(); }
+
+  bool satisfies(const std::shared_ptr<KRDBEntity>& entity) {
+    return request->isEntitySatisfyingFilterConditions(entity);
+  }
+
+  std::shared_ptr<Request> request = Request::init();
+};
+
+TEST_F(KRDBFilteredImagesFetchRequestTest, TheConditionKindsAreTheEngineKeys) {
+  EXPECT_EQ(KRImagesConditionType, kImage);
+  EXPECT_EQ(KRUserAttributesConditionType, kUser);
+  EXPECT_EQ(KRExivAttributesConditionType, kExiv);
+  EXPECT_EQ(request->entityType(), 1);
+  EXPECT_TRUE(std::dynamic_pointer_cast<dbcore::DBImgSelectQuery>(request->selectQuery()));
+}
+
+TEST_F(KRDBFilteredImagesFetchRequestTest, WithoutConditionsThePredicatesAreAlwaysTrue) {
+  EXPECT_EQ(request->imageCondition(), KRString(""));
+  EXPECT_EQ(formatOf(request->wherePredicate()), "TRUEPREDICATE");
+  EXPECT_EQ(formatOf(request->userAttributesPredicate()), "TRUEPREDICATE");
+  EXPECT_EQ(formatOf(request->exivAttributesPredicate()), "TRUEPREDICATE");
+  EXPECT_TRUE(satisfies(image(1, L"a.jpg")));
+  // The in-memory test checks the flag only with an image condition; the engine query always does.
+  const auto marked = image(2, L"b.jpg");
+  marked->dbentity()->set_marked_to_delete(true);
+  marked->storeInfoFromDBentity(marked->dbentity());
+  ASSERT_TRUE(marked->isMarkedToDelete());
+  EXPECT_TRUE(satisfies(marked));
+  request->setFilterConditions({{kImage, "import_index >= 0"}});
+  EXPECT_FALSE(satisfies(marked));
+}
+
+TEST_F(KRDBFilteredImagesFetchRequestTest, ThePathColumnBecomesTheNameKeyPath) {
+  request->setFilterConditions({{kImage, "path_wide_ch == 'x'"}});
+  EXPECT_EQ(request->imageCondition(), KRString("(path_wide_ch == 'x')"));
+  EXPECT_EQ(Request::predicateFormatWithCondition("(path_wide_ch == 'x')", Request::imageColumnKeyPaths()),
+            "(name == 'x')");
+  EXPECT_EQ(formatOf(request->wherePredicate()),
+            formatOf(KRPredicate::predicateWithFormat("markedToDelete == NO && (name == 'x')")));
+  EXPECT_TRUE(satisfies(image(1, L"x")));
+  EXPECT_FALSE(satisfies(image(2, L"y")));
+}
+
+TEST_F(KRDBFilteredImagesFetchRequestTest, LongerColumnNamesAreReplacedFirst) {
+  const auto& exiv = Request::exivAttributesColumnKeyPaths();
+  ASSERT_EQ(exiv.size(), 25u);
+  EXPECT_EQ(Request::imageColumnKeyPaths().size(), 7u);
+  EXPECT_EQ(Request::userAttributesColumnKeyPaths().size(), 7u);
+  EXPECT_EQ(exiv.front(),
+            (std::pair<std::string, std::string>{"lens_pretty_name_wide_ch", "lensPrettyName"}));
+  EXPECT_EQ(Request::predicateFormatWithCondition(
+                "focal_len35mm == 50 && focal_len_min < 24 && focal_len_max > 70 && focal_len == 35 && "
+                "white_balance_index == 5 && white_balance == 3 && shutter_min < 1 && shutter_speed > 0",
+                exiv),
+            "focalLength35 == 50 && minFocalLength < 24 && maxFocalLength > 70 && focalLength == 35 && "
+            "whiteBalanceIndex == 5 && whiteBalance == 3 && minShutter < 1 && shutterSpeed > 0");
+  EXPECT_EQ(Request::predicateFormatWithCondition(
+                "date_time_int_64 > 5 && is_raw_bool == true && number >= 2.8 && _id_int_64 == 4", exiv),
+            "date.timeIntervalSince1970 > 5 && raw == YES && fNumber >= 2.8 && entityID.dbid == 4");
+  EXPECT_EQ(Request::predicateFormatWithCondition("modification_date_int_64 < 9 && import_date_int_64 > 1",
+                                                  Request::imageColumnKeyPaths()),
+            "modificationDate.timeIntervalSince1970 < 9 && importDate.timeIntervalSince1970 > 1");
+}
+
+TEST_F(KRDBFilteredImagesFetchRequestTest, TrueAndFalseAreReplacedInsideLiteralsToo) {
+  EXPECT_EQ(Request::predicateFormatWithCondition(
+                "origin_path_wide_ch == 'untrue_falsehood.jpg' && lost_bool == false",
+                Request::userAttributesColumnKeyPaths()),
+            "originName == 'unYES_NOhood.jpg' && lost == NO");
+  request->setFilterConditions({{kUser, "origin_path_wide_ch == 'true.jpg'"}});
+  EXPECT_EQ(formatOf(request->userAttributesPredicate()),
+            formatOf(KRPredicate::predicateWithFormat("(originName == 'YES.jpg')")));
+}
+
+TEST_F(KRDBFilteredImagesFetchRequestTest, FilterAndCustomConditionsAreJoined) {
+  request->setFilterConditions({{kImage, "import_index > 1"}, {kExiv, "iso_speed > 100"}});
+  request->setCustomConditions({{kImage, "import_index < 5"}, {kUser, "trash_bool == false"}});
+  EXPECT_EQ(request->imageCondition(), KRString("(import_index > 1) && (import_index < 5)"));
+  EXPECT_EQ(request->userAttributesCondition(), KRString("(trash_bool == false)"));
+  EXPECT_EQ(request->exivAttributesCondition(), KRString("(iso_speed > 100)"));
+  EXPECT_EQ(request->valueForKey("imageCondition"), KRValue("(import_index > 1) && (import_index < 5)"));
+}
+
+TEST_F(KRDBFilteredImagesFetchRequestTest, TwoComputedSubExpressionsAreBothReplaced) {
+  request->setCustomConditions(
+      {{kImage, "import_index >= $MAT_FUNCTION[1 + 1] && import_index <= $MAT_FUNCTION[9 / 3]"}});
+  EXPECT_EQ(request->imageCondition(), KRString("(import_index >= 2 && import_index <= 3)"));
+  request->setCustomConditions({{kImage, "import_index >= $MAT_FUNCTION[1 + 1"}});
+  EXPECT_TRUE(request->imageCondition().isNil());
+  EXPECT_EQ(formatOf(request->wherePredicate()), "TRUEPREDICATE");
+}
+
+TEST_F(KRDBFilteredImagesFetchRequestTest, AnImageOutsideTheFiltersIsRejected) {
+  const auto inside = image(1, L"a.jpg");
+  const auto outside = image(2, L"b.jpg");
+  request->setFilters(std::make_shared<const KRDBEntitySet>(
+      KRDBEntitySet{collection(7, {image(3, L"c.jpg")}), collection(8, {inside})}));
+  EXPECT_TRUE(satisfies(inside));
+  EXPECT_FALSE(satisfies(outside));
+  request->setFilters(std::make_shared<const KRDBEntitySet>());
+  EXPECT_TRUE(satisfies(outside));
+}
+
+TEST_F(KRDBFilteredImagesFetchRequestTest, AnImageOnAnotherVolumeIsRejectedWhateverItsPath) {
+  const auto photos = volume(1);
+  const auto other = volume(2);
+  request->setFolder(folder(path(10, L"/photos", photos)));
+  const auto below = image(1, L"a.jpg");
+  below->setFolderDBPathPrimitive(path(11, L"/photos/2024", photos));
+  const auto elsewhere = image(2, L"b.jpg");
+  elsewhere->setFolderDBPathPrimitive(path(12, L"/photos/2024", other));
+  const auto sibling = image(3, L"c.jpg");
+  sibling->setFolderDBPathPrimitive(path(13, L"/photos2", photos));
+  const auto same = image(4, L"d.jpg");
+  same->setFolderDBPathPrimitive(path(14, L"/photos/", photos));
+  EXPECT_TRUE(satisfies(below));
+  EXPECT_FALSE(satisfies(elsewhere));
+  EXPECT_FALSE(satisfies(sibling));
+  EXPECT_TRUE(satisfies(same));
+  EXPECT_FALSE(satisfies(image(5, L"e.jpg")));
+  // A folder with an empty path covers its whole volume.
+  request->setFolder(folder(path(15, L"", photos)));
+  EXPECT_TRUE(satisfies(sibling));
+  EXPECT_FALSE(satisfies(elsewhere));
+}
+
+TEST_F(KRDBFilteredImagesFetchRequestTest, AnImageNeedsBothAttributeEntities) {
+  const auto withoutUser = image(1, L"a.jpg");
+  withoutUser->setAttributesPrimitive(nullptr);
+  EXPECT_FALSE(satisfies(withoutUser));
+  const auto withoutExif = image(2, L"b.jpg");
+  withoutExif->setExivAttributesPrimitive(nullptr);
+  EXPECT_FALSE(satisfies(withoutExif));
+  EXPECT_FALSE(satisfies(volume(3)));
+  EXPECT_FALSE(satisfies(nullptr));
+}
+
+TEST_F(KRDBFilteredImagesFetchRequestTest, TheAttributePredicatesTestTheAttributeEntities) {
+  const auto trashed = image(1, L"a.jpg");
+  trashed->attributesPrimitive()->setTrashed(true);
+  const auto kept = image(2, L"b.jpg");
+  request->setFilterConditions({{kUser, "trash_bool == true"}});
+  EXPECT_TRUE(satisfies(trashed));
+  EXPECT_FALSE(satisfies(kept));
+  request->setCustomConditions({{kExiv, "iso_speed > 100"}});
+  EXPECT_FALSE(satisfies(trashed));
+  trashed->exivAttributesPrimitive()->setIsoSpeed(400);
+  EXPECT_TRUE(satisfies(trashed));
+}
+
+TEST_F(KRDBFilteredImagesFetchRequestTest, BadConditionsMatchNothingInMemory) {
+  const auto candidate = image(1, L"x");
+  for (const char* condition :
+       {"path_wide_ch ==", "nope_int_64 == 3", "path_wide_ch == 'x'; DROP TABLE images",
+        "path_wide_ch == 'x' || 1 == 1 --", "((("}) {
+    request->setFilterConditions({{kImage, condition}});
+    EXPECT_FALSE(satisfies(candidate)) << condition;
+  }
+}
+
+TEST_F(KRDBFilteredImagesFetchRequestTest, OnlyAnotherSettingObjectResetsTheRequest) {
+  const KRDictionary conditions{{kImage, "import_index > 1"}};
+  request->setFilterConditions(conditions);
+  const auto query = request->selectQuery();
+  const auto predicate = request->wherePredicate();
+  request->setFilterConditions(conditions);
+  EXPECT_EQ(request->selectQuery(), query);
+  EXPECT_EQ(request->wherePredicate(), predicate);
+  request->setFilterConditions(KRDictionary{{kImage, "import_index > 1"}});
+  EXPECT_NE(request->selectQuery(), query);
+  EXPECT_NE(request->wherePredicate(), predicate);
+  const auto folderEntity = folder(path(1, L"/a", volume(1)));
+  request->setFolder(folderEntity);
+  const auto withFolder = request->selectQuery();
+  request->setFolder(folderEntity);
+  EXPECT_EQ(request->selectQuery(), withFolder);
+  // Nil again is the same setting; an empty dictionary is another object.
+  request->setCustomConditions({});
+  EXPECT_EQ(request->selectQuery(), withFolder);
+  request->setCustomConditions(KRDictionary::dictionary());
+  EXPECT_NE(request->selectQuery(), withFolder);
+  const auto custom = request->exivAttributesPredicate();
+  request->setExivAttributesPredicate(KRPredicate::predicateWithValue(false));
+  EXPECT_NE(request->exivAttributesPredicate(), custom);
+  EXPECT_EQ(formatOf(request->exivAttributesPredicate()), "FALSEPREDICATE");
+}
+
+TEST_F(KRDBFilteredImagesFetchRequestTest, SettingsAreKeyValueProperties) {
+  const auto folderEntity = folder(path(1, L"/a", volume(1)));
+  request->setValueForKey(KRValue(folderEntity), "folder");
+  EXPECT_EQ(request->folder(), folderEntity);
+  request->setValueForKey(KRDictionary{{kImage, "import_index > 1"}}, "customConditions");
+  EXPECT_EQ(request->imageCondition(), KRString("(import_index > 1)"));
+  const auto filter = collection(3, {});
+  request->setValueForKey(KRSet({KRValue(filter)}), "filters");
+  ASSERT_TRUE(request->filters());
+  EXPECT_TRUE(request->filters()->contains(filter));
+  EXPECT_EQ(request->valueForKey("filters"), KRValue(KRSet({KRValue(filter)})));
+}
+
+TEST_F(KRDBFilteredImagesFetchRequestTest, AnUnknownKeyIsLoggedAndIgnored) {
+  const KRCapturingLogSink sink;
+  request->setValueForKey(KRValue(3), "noSuchKey");
+  const auto records = sink.records();
+  ASSERT_EQ(records.size(), 1u);
+  EXPECT_EQ(records[0].level, 4);
+  EXPECT_EQ(records[0].sourcePath,
+            "DBCore/DBCoreMacWrapper/DBCoreWrapper/Model/KRDBFilteredImagesFetchRequest/"
+            "KRDBFilteredImagesFetchRequest");
+  EXPECT_EQ(records[0].function, "setValueForUndefinedKey");
+  EXPECT_EQ(records[0].message,
+            "Warning!!!\nUndefined Key: noSuchKey\nFor obj Class: KRDBFilteredImagesFetchRequest");
+}
+
+}  // namespace

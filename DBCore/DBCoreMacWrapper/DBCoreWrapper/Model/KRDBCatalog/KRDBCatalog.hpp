@@ -22,6 +22,7 @@ class KRDBEntity;
 class KRDBAbstractBaseFolder;
 class KRDBEntityFavoriteAlias;
 class KRDBImage;
+class KRDBFilteredEntitiesFetchRequest;
 class KRDBImageState;
 class KRDBPath;
 class KRDBVolume;
@@ -270,6 +271,32 @@ class KRDBCatalog : public KRAbstractModel {
                                    ResultHandler<std::shared_ptr<KRDBImage>> handler, bool sync);
   std::shared_ptr<KRDBImage> fetchImageForExivAttributes(
       const std::shared_ptr<KRDBImageExivAttributes>& attributes);
+
+  // ---- Fetch-request execution and additional fetching (KRDBCatalogExecution.cpp). The entities built
+  // here are not cached yet: the context replaces them by its own instances.
+  using FetchRequestPtr = std::shared_ptr<KRDBFilteredEntitiesFetchRequest>;
+  void obtainFetchedEntitiesUsingFetchRequest(const FetchRequestPtr& request,
+                                              ResultHandler<KRDBEntitySet> handler, bool sync);
+  // The entities that the request selects; an empty set (and a logged error) for a type that cannot be
+  // fetched by request, an empty set for a request without a query of the type's class.
+  KRDBEntitySet fetchEntitiesUsingFetchRequestSync(const FetchRequestPtr& request);
+  KRDBEntitySet fetchImagesUsingFetchRequestSync(const FetchRequestPtr& request);
+  KRDBEntitySet fetchReffoldersUsingFetchRequestSync(const FetchRequestPtr& request);
+  KRDBEntitySet fetchPathsUsingFetchRequestSync(const FetchRequestPtr& request);
+  KRDBEntitySet fetchImageAttributesUsingFetchRequestSync(const FetchRequestPtr& request);
+  KRDBEntitySet fetchImageExivAttributesUsingFetchRequestSync(const FetchRequestPtr& request);
+  KRDBEntitySet fetchFavoriteAliasUsingFetchRequestSync(const FetchRequestPtr& request);
+  KRDBEntitySet fetchVolumesUsingFetchRequestSync(const FetchRequestPtr& request);
+  // Image id -> folder path id (the smallest, for an image in several), delivered on the main thread.
+  void fetchConnectionsForImagesWithDBPathesWithHandler(ResultHandler<KRDictionary> handler);
+  void additionalFetchingForEntities(const KRDBEntitySet& entities, ResultHandler<KRDBEntitySet> handler,
+                                     bool sync);
+  // Attaches the linked records each entity needs; answers the linked entities fetched now.
+  KRDBEntitySet additionalFetchingSyncForEntities(const KRDBEntitySet& entities);
+  KRDBEntityArray additionalFetchingForImage(const std::shared_ptr<KRDBImage>& image);
+  KRDBEntityArray additionalFetchingForReffolderSync(const std::shared_ptr<KRDBReferencedFolder>& folder);
+  KRDBEntityArray additionalFetchingForDBPath(const std::shared_ptr<KRDBPath>& path);
+  KRDBEntityArray additionalFetchingForFavoriteAlias(const std::shared_ptr<KRDBEntityFavoriteAlias>& alias);
 
   // ---- Fetch, update, deletion, dangling records (KRDBCatalogStorage.cpp)
   using StringsHandler = std::function<void(std::vector<KRString>)>;

@@ -11,6 +11,7 @@
 #include "Model/KRDBCatalog/KRDBCatalog.hpp"
 #include "Model/KRDBCollection/KRDBCollection.hpp"
 #include "Model/KRDBEntityFavoriteAlias/KRDBEntityFavoriteAlias.hpp"
+#include "Model/KRDBFilteredImagesFetchRequest/KRDBFilteredImagesFetchRequest.hpp"
 #include "Model/KRDBImage/KRDBImage.hpp"
 #include "Model/KRDBImageAttributes/KRDBImageAttributes.hpp"
 #include "Model/KRDBImageExivAttributes/KRDBImageExivAttributes.hpp"
@@ -182,51 +183,6 @@ Result waitFor(const std::function<void(KRDBCatalog::ResultHandler<Result>)>& ca
   return stored;
 }
 
-// A condition of a smart filter's conditions by kind; empty when absent or not a string.
-std::string conditionOf(const KRDictionary& conditions, const std::wstring& kind) {
-  if (conditions.isNil()) return {};
-  const KRValue& condition = conditions.objectForKey(KRString::krs_stringWithWString(kind));
-  return condition.isString() ? condition.string().str() : std::string();
-}
-
-// The image select of a tree folder: a collection's members, the images at or under a referenced folder's
-// path, the images that satisfy a smart filter's conditions.
-std::shared_ptr<dbcore::DBImgSelectQuery> imagesQuery(KRDBCatalog& catalog, const EntityPtr& filter) {
-  auto query = std::make_shared<dbcore::DBImgSelectQuery>();
-  std::string imageCondition;
-  switch (entityTypeOf(filter)) {
-    case KRDBEntityTypeCollection:
-      query->Filters({filter->entityID()->dbid()});
-      break;
-    case KRDBEntityTypeReferencedFolder: {
-      const auto folder = std::static_pointer_cast<KRDBReferencedFolder>(filter);
-      auto path = folder->dbPath() ? folder->dbPath() : catalog.fetchPathForReferencedFolderSync(folder);
-      query->PathPrefix(path ? path->dbpath() : nullptr);
-      break;
-    }
-    case KRDBEntityTypeSmartFilter: {
-      const KRDictionary& conditions = std::static_pointer_cast<KRDBSmartFilter>(filter)->filterConditions();
-      imageCondition = conditionOf(conditions, dbcore::kImagesConditionKey);
-      const std::string user = conditionOf(conditions, dbcore::kUserAttributesConditionKey);
-      const std::string exiv = conditionOf(conditions, dbcore::kExivAttributesConditionKey);
-      if (!user.empty())
-        query->Join<DBUserImgAttrib>(
-            std::make_shared<dbcore::DBClause>(dbcore::clauseWithCondition<DBUserImgAttrib>(user, true)));
-      if (!exiv.empty())
-        query->Join<DBExivImgAttrib>(
-            std::make_shared<dbcore::DBClause>(dbcore::clauseWithCondition<DBExivImgAttrib>(exiv, true)));
-      break;
-    }
-    default:
-      return nullptr;
-  }
-  const std::string where = imageCondition.empty()
-                                ? kNotMarkedToDelete
-                                : std::string(kNotMarkedToDelete) + " && (" + imageCondition + ")";
-  query->Where(std::make_shared<dbcore::DBClause>(dbcore::clauseWithCondition<DBImage>(where, false)));
-  return query;
-}
-
 // The (states' records, position of the current one) pair of one image.
 std::pair<std::vector<std::shared_ptr<DBImgHistoryState>>, long long> statesPair(
     const KRDBImageStates& states, const std::shared_ptr<KRDBImageState>& currentState) {
@@ -318,14 +274,30 @@ void KRDBCatalog::addChilds(const KRDBEntitySet& childs, const std::shared_ptr<K
 
 // ---- Members
 
+// The images of a tree folder through an image request: a collection's members, the images at or under a
+// referenced folder's path (fetched first when the folder does not hold it), the images that satisfy a
+// smart filter's conditions.
 KRDBEntityArray KRDBCatalog::fetchImagesOfFilterSync(const std::shared_ptr<KRDBEntity>& filter) {
-  const Reactor reactor = dbReactor();
-  const auto query = reactor ? imagesQuery(*this, filter) : nullptr;
-  if (!query) return {};
-  KRDBEntityArray images;
-  for (const auto& record : reactor->GetBySelectQuery<DBImage>(query))
-    images.push_back(KRDBImage::initWithDBEntity(record));
-  return images;
+  const auto request = KRDBFilteredImagesFetchRequest::init();
+  switch (entityTypeOf(filter)) {
+    case KRDBEntityTypeCollection:
+      request->setFilters(std::make_shared<const KRDBEntitySet>(KRDBEntitySet{filter}));
+      break;
+    case KRDBEntityTypeReferencedFolder: {
+      const auto folder = std::static_pointer_cast<KRDBReferencedFolder>(filter);
+      if (!folder->dbPath()) folder->setDbPath(fetchPathForReferencedFolderSync(folder));
+      if (!folder->dbPath()) return {};
+      request->setFolder(folder);
+      break;
+    }
+    case KRDBEntityTypeSmartFilter:
+      request->setFilterConditions(std::static_pointer_cast<KRDBSmartFilter>(filter)->filterConditions());
+      break;
+    default:
+      return {};
+  }
+  const KRDBEntitySet images = fetchEntitiesUsingFetchRequestSync(request);
+  return KRDBEntityArray(images.begin(), images.end());
 }
 
 void KRDBCatalog::fetchImagesOfFilter(const std::shared_ptr<KRDBEntity>& filter,

@@ -41,10 +41,12 @@ class KRFetchRequestCatalog {
     return entities;
   }
   // Images named IMG_<index>.JPG with their user and exif attribute records; with `withCamera`, the
-  // exif values of KRTestExifReader's camera.
-  KRDBEntityArray createImages(int count, bool withCamera = false) {
+  // exif values of KRTestExifReader's camera. Image i lies in folders[i % count of folders], if any.
+  // Indexes start at `first`.
+  KRDBEntityArray createImages(int count, bool withCamera = false, const KRDBEntityArray& folders = {},
+                               int first = 0) {
     std::vector<KRDictionary> infos;
-    for (int index = 0; index < count; ++index) {
+    for (int index = first; index < first + count; ++index) {
       const std::string name = "IMG_" + std::to_string(index) + ".JPG";
       infos.push_back({{"DBImageInfoExifReader",
                         KRTestExifReader::make({"/p/" + name, 600, 400, 1000 + index,
@@ -52,6 +54,10 @@ class KRFetchRequestCatalog {
                                                 KRDate::dateWithTimeIntervalSince1970(1500000000)},
                                                withCamera)},
                        {"DBImageInfoImageName", name}});
+      if (!folders.empty()) {
+        infos.back() = infos.back().dictionaryBySettingObject(folders[index % folders.size()],
+                                                              "DBImageInfoFolderDBPath");
+      }
     }
     return create(KRDBEntityTypeImage, infos);
   }

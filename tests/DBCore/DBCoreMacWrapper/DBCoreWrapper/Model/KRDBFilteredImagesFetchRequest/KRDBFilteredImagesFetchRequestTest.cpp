@@ -289,3 +289,166 @@ TEST_F(KRDBFilteredImagesFetchRequestTest, AnUnknownKeyIsLoggedAndIgnored) {
 }
 
 }  // namespace
+
+namespace {
+
+// Eight images on a real catalog: image i is IMG_i.JPG of 1000 + i bytes; the even ones carry the test
+// reader's camera (ISO 400, raw, Canon). Their folders cycle through /photos and /photos/2024 on the
+// first volume, /photos/2024 on the second and /photos2 on the first. Image 0 is marked to delete,
+// images 1 and 2 are trashed, images 2, 3 and 5 are in a collection, and a referenced folder points at
+// /photos on the first volume.
+class KRDBFilteredImagesFetchRequestCatalogTest : public testing::Test {
+ protected:
+  void SetUp() override {
+    const auto volumes = catalog.create(KRDBEntityTypeVolume, {{}, {}});
+    const auto paths = catalog.create(KRDBEntityTypePath,
+                                      {{{"DBPathInfoPath", "/photos"}, {"DBPathInfoVolume", volumes[0]}},
+                                       {{"DBPathInfoPath", "/photos/2024"}, {"DBPathInfoVolume", volumes[0]}},
+                                       {{"DBPathInfoPath", "/photos/2024"}, {"DBPathInfoVolume", volumes[1]}},
+                                       {{"DBPathInfoPath", "/photos2"}, {"DBPathInfoVolume", volumes[0]}}});
+    KRDBEntityArray created;
+    for (int index = 0; index < 8; ++index) {
+      const auto one = catalog.createImages(1, index % 2 == 0, paths, index);
+      created.push_back(one.at(0));
+    }
+    catalog.markFirstToDelete<DBImage>();
+    trash({created[1], created[2]});
+    const auto collection = catalog.create(KRDBEntityTypeCollection, {{}}).at(0);
+    const KRDBEntitySet members{created[2], created[3], created[5]};
+    catalog.onEngine([&](const KRFetchRequestCatalog::Reactor& reactor) {
+      for (const auto& member : members) {
+        reactor->FilterAddImage(collection->entityID()->dbid(),
+                                std::dynamic_pointer_cast<DBImage>(member->dbentity()));
+      }
+    });
+    referencedFolder = std::dynamic_pointer_cast<KRDBReferencedFolder>(
+        catalog.create(KRDBEntityTypeReferencedFolder, {{{"DBReferencedFolderPath", paths[0]}}}).at(0));
+    ASSERT_TRUE(referencedFolder);
+    ASSERT_EQ(referencedFolder->dbPath(), paths[0]);
+    loadImages(created);
+    std::dynamic_pointer_cast<KRDBCollection>(collection)
+        ->setImagesPrimitive(
+            std::make_shared<const KRDBEntitySet>(KRDBEntitySet{byIndex[2], byIndex[3], byIndex[5]}));
+    collections = std::make_shared<const KRDBEntitySet>(KRDBEntitySet{collection});
+  }
+
+  void trash(const KRDBEntityArray& images) {
+    std::vector<std::shared_ptr<DBUserImgAttrib>> records;
+    for (const auto& record : catalog.allRecords<DBUserImgAttrib>()) {
+      for (const auto& image : images) {
+        if (record->image_id == image->entityID()->dbid()) records.push_back(record);
+      }
+    }
+    for (const auto& record : records) record->trashed = true;
+    catalog.onEngine([&](const KRFetchRequestCatalog::Reactor& reactor) { *reactor << records; });
+  }
+
+  // Entities over the records as the engine now holds them, with their folders and attributes.
+  void loadImages(const KRDBEntityArray& created) {
+    std::map<int64_t, std::shared_ptr<KRDBImageAttributes>> users;
+    for (const auto& record : catalog.allRecords<DBUserImgAttrib>()) {
+      users[record->image_id] = KRDBImageAttributes::initWithDBEntity(record);
+    }
+    std::map<int64_t, std::shared_ptr<KRDBImageExivAttributes>> exifs;
+    for (const auto& record : catalog.allRecords<DBExivImgAttrib>()) {
+      exifs[record->image_id] = KRDBImageExivAttributes::initWithDBEntity(record);
+    }
+    for (const auto& record : catalog.allRecords<DBImage>()) {
+      const auto image = KRDBImage::initWithDBEntity(record);
+      image->setAttributesPrimitive(users[record->id()]);
+      image->setExivAttributesPrimitive(exifs[record->id()]);
+      for (size_t index = 0; index < created.size(); ++index) {
+        if (created[index]->entityID()->dbid() != record->id()) continue;
+        image->setFolderDBPathPrimitive(std::dynamic_pointer_cast<KRDBImage>(created[index])->folderDBPath());
+        byIndex[index] = image;
+        idOf[index] = record->id();
+      }
+    }
+  }
+
+  Ids selected() { return catalog.selectedIds<DBImage>(request->selectQuery()); }
+  // The images not marked to delete whose in-memory test answers yes (without an image condition the
+  // in-memory test does not look at the flag, see WithoutConditionsEveryImageNotMarkedToDeleteIsSelected).
+  Ids satisfying() {
+    Ids result;
+    for (const auto& [index, image] : byIndex) {
+      if (!image->isMarkedToDelete() && request->isEntitySatisfyingFilterConditions(image))
+        result.insert(image->entityID()->dbid());
+    }
+    return result;
+  }
+  Ids ids(std::initializer_list<int> indexes) {
+    Ids result;
+    for (int index : indexes) result.insert(idOf.at(index));
+    return result;
+  }
+  // The engine and the in-memory test select the same images, and those are the expected ones.
+  void expectSelection(const Ids& expected) {
+    EXPECT_EQ(selected(), expected);
+    EXPECT_EQ(satisfying(), expected);
+  }
+
+  KRFetchRequestCatalog catalog;
+  std::shared_ptr<Request> request = Request::init();
+  std::shared_ptr<KRDBReferencedFolder> referencedFolder;
+  Request::FiltersPtr collections;
+  std::map<size_t, std::shared_ptr<KRDBImage>> byIndex;
+  std::map<size_t, int64_t> idOf;
+};
+
+TEST_F(KRDBFilteredImagesFetchRequestCatalogTest, WithoutConditionsEveryImageNotMarkedToDeleteIsSelected) {
+  EXPECT_EQ(selected(), ids({1, 2, 3, 4, 5, 6, 7}));
+  EXPECT_EQ(satisfying(), ids({1, 2, 3, 4, 5, 6, 7}));
+  // In memory the flag is tested only with an image condition.
+  EXPECT_TRUE(request->isEntitySatisfyingFilterConditions(byIndex.at(0)));
+  request->setFilterConditions({{kImage, "import_index >= 0"}});
+  EXPECT_FALSE(request->isEntitySatisfyingFilterConditions(byIndex.at(0)));
+}
+
+TEST_F(KRDBFilteredImagesFetchRequestCatalogTest, ImageConditionsSelectAlike) {
+  request->setFilterConditions({{kImage, "file_size_int_64 >= 1003"}});
+  expectSelection(ids({3, 4, 5, 6, 7}));
+  request->setFilterConditions({{kImage, "path_wide_ch == 'IMG_0.JPG' || path_wide_ch == 'IMG_4.JPG'"}});
+  expectSelection(ids({4}));
+  request->setFilterConditions({{kImage, "import_index >= 0 && file_size_int_64 < 1002"}});
+  expectSelection(ids({1}));
+}
+
+TEST_F(KRDBFilteredImagesFetchRequestCatalogTest, AttributeConditionsSelectAlike) {
+  request->setFilterConditions({{kUser, "trash_bool == true"}});
+  expectSelection(ids({1, 2}));
+  request->setFilterConditions({{kExiv, "iso_speed > 100 && is_raw_bool == true"}});
+  expectSelection(ids({2, 4, 6}));
+  request->setCustomConditions({{kUser, "trash_bool == false"}, {kImage, "file_size_int_64 > 1002"}});
+  expectSelection(ids({4, 6}));
+  request->setFilterConditions({{kExiv, "camera_maker_wide_ch == 'Canon' && focal_len35mm > 50"}});
+  request->setCustomConditions({});
+  expectSelection(ids({2, 4, 6}));
+}
+
+TEST_F(KRDBFilteredImagesFetchRequestCatalogTest, FiltersAndFolderSelectAlike) {
+  request->setFilters(collections);
+  expectSelection(ids({2, 3, 5}));
+  request->setFilters(nullptr);
+  request->setFolder(referencedFolder);
+  // /photos and /photos/2024 on the first volume; not the second volume's /photos/2024, not /photos2.
+  expectSelection(ids({1, 4, 5}));
+  request->setFilters(collections);
+  request->setFilterConditions({{kUser, "trash_bool == false"}});
+  expectSelection(ids({5}));
+}
+
+TEST_F(KRDBFilteredImagesFetchRequestCatalogTest, BadConditionsSelectNothing) {
+  for (const char* condition : {"path_wide_ch ==", "path_wide_ch == 'IMG_1.JPG'; DROP TABLE images",
+                                "nope_int_64 == 3", "file_size_int_64 == path_wide_ch", ")) || ((1 == 1"}) {
+    request->setFilterConditions({{kImage, condition}});
+    expectSelection({});
+  }
+  request->setFilterConditions({{kUser, "trash_bool == true &&"}});
+  expectSelection({});
+  request->setFilterConditions({{kExiv, "camera_maker_wide_ch == 5 || ("}});
+  expectSelection({});
+  EXPECT_EQ(catalog.allRecords<DBImage>().size(), 8u);
+}
+
+}  // namespace

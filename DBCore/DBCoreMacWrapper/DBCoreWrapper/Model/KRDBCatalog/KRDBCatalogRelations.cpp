@@ -20,10 +20,7 @@
 #include "Model/KRDBReferencedFolder/KRDBReferencedFolder.hpp"
 #include "Model/KRDBSmartFilter/KRDBSmartFilter.hpp"
 #include "Model/KRDBVolume/KRDBVolume.hpp"
-#include "dbclause.hpp"
-#include "dbconstants.hpp"
 #include "dbexception.hpp"
-#include "dbimgselectquery.hpp"
 #include "dbreactor.hpp"
 
 using dbcore::DBExivImgAttrib;
@@ -52,9 +49,6 @@ const char* const kBindVolumeOperation = "BindDBPathDBVolume";
 const char* const kRenamePathOperation = "RenamePath";
 const char* const kBindImagesOperation = "BindDBAttributesDBImageArray";
 const char* const kRebindImagesOperation = "ReBindDBAttributesDBImageArray";
-
-// The condition that every image select starts with: images marked to delete are never selected.
-const char* const kNotMarkedToDelete = "(marked_to_delete_bool == false)";
 
 int64_t entityTypeOf(const EntityPtr& entity) { return entity ? entity->entityClass().entityType : 0; }
 

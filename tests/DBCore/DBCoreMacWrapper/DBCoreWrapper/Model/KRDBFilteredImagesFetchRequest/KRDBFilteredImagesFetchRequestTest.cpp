@@ -2,7 +2,9 @@
 
 #include <gtest/gtest.h>
 
+#include <atomic>
 #include <map>
+#include <thread>
 
 #include "../KRDBFilteredEntitiesFetchRequest/KRFetchRequestCatalog.hpp"
 #include "KRServices/KRCapturingLogSink.hpp"
@@ -232,6 +234,27 @@ TEST_F(KRDBFilteredImagesFetchRequestTest, BadConditionsMatchNothingInMemory) {
     request->setFilterConditions({{kImage, condition}});
     EXPECT_FALSE(satisfies(candidate)) << condition;
   }
+}
+
+TEST_F(KRDBFilteredImagesFetchRequestTest, TheTestAnswersTheSameFromSeveralThreadsAtOnce) {
+  std::vector<std::shared_ptr<KRDBImage>> images;
+  for (int64_t id = 1; id <= 300; ++id) {
+    images.push_back(image(id, id % 2 == 0 ? L"even.jpg" : L"odd.jpg"));
+    images.back()->attributesPrimitive()->setTrashed(id % 3 == 0);
+  }
+  request->setFilterConditions({{kImage, "path_wide_ch == 'even.jpg'"}, {kUser, "trash_bool == false"}});
+  std::atomic<int> wrong = 0;
+  std::vector<std::thread> threads;
+  for (int thread = 0; thread < 4; ++thread) {
+    threads.emplace_back([&] {
+      for (size_t index = 0; index < images.size(); ++index) {
+        const int64_t id = static_cast<int64_t>(index) + 1;
+        if (satisfies(images[index]) != (id % 2 == 0 && id % 3 != 0)) ++wrong;
+      }
+    });
+  }
+  for (auto& thread : threads) thread.join();
+  EXPECT_EQ(wrong.load(), 0);
 }
 
 TEST_F(KRDBFilteredImagesFetchRequestTest, OnlyAnotherSettingObjectResetsTheRequest) {

@@ -168,10 +168,9 @@ bool KRDBFilteredImagesFetchRequest::isEntitySatisfyingFilterConditions(
   if (!entity) return false;
   try {
     if (!evaluates(wherePredicate(), KRValue(entity))) return false;
-    if (entity->entityID()->entityType() == KRDBEntityTypeNone) return false;
-    const auto image = entity->entityID()->entityType() == KRDBEntityTypeImage
-                           ? std::dynamic_pointer_cast<KRDBImage>(entity)
-                           : nullptr;
+    const int64_t type = entity->entityID()->entityType();
+    if (type == KRDBEntityTypeNone) return false;
+    const auto image = type == KRDBEntityTypeImage ? std::dynamic_pointer_cast<KRDBImage>(entity) : nullptr;
     return isInFilters(image) && isInFolder(image) && isSatisfyingAttributes(image);
   } catch (const KRException&) {
     // A condition that does not parse as a predicate, or names a key the entities do not know, matches
@@ -246,12 +245,15 @@ std::string KRDBFilteredImagesFetchRequest::predicateFormatWithCondition(const s
   return text;
 }
 
-KRPredicatePtr KRDBFilteredImagesFetchRequest::predicate(PredicateSlot slot, const KRString& condition,
+KRPredicatePtr KRDBFilteredImagesFetchRequest::predicate(PredicateSlot slot, ConditionGetter conditionGetter,
                                                          const ColumnKeyPaths& columns, const char* prefix) {
   {
     const std::lock_guard lock(predicatesMutex_);
     if (this->*slot) return this->*slot;
   }
+  // The condition is prepared only when the predicate is made: the in-memory test asks for the cached
+  // predicates on every entity.
+  const KRString condition = (this->*conditionGetter)();
   KRPredicatePtr made;
   if (condition.empty()) {
     made = KRPredicate::predicateWithValue(true);
@@ -271,18 +273,21 @@ void KRDBFilteredImagesFetchRequest::storePredicate(PredicateSlot slot, KRPredic
 }
 
 KRPredicatePtr KRDBFilteredImagesFetchRequest::wherePredicate() {
-  return predicate(&KRDBFilteredImagesFetchRequest::wherePredicate_, imageCondition(), imageColumnKeyPaths(),
+  return predicate(&KRDBFilteredImagesFetchRequest::wherePredicate_,
+                   &KRDBFilteredImagesFetchRequest::imageCondition, imageColumnKeyPaths(),
                    kNotMarkedToDeletePredicate);
 }
 
 KRPredicatePtr KRDBFilteredImagesFetchRequest::userAttributesPredicate() {
-  return predicate(&KRDBFilteredImagesFetchRequest::userAttributesPredicate_, userAttributesCondition(),
-                   userAttributesColumnKeyPaths(), nullptr);
+  return predicate(&KRDBFilteredImagesFetchRequest::userAttributesPredicate_,
+                   &KRDBFilteredImagesFetchRequest::userAttributesCondition, userAttributesColumnKeyPaths(),
+                   nullptr);
 }
 
 KRPredicatePtr KRDBFilteredImagesFetchRequest::exivAttributesPredicate() {
-  return predicate(&KRDBFilteredImagesFetchRequest::exivAttributesPredicate_, exivAttributesCondition(),
-                   exivAttributesColumnKeyPaths(), nullptr);
+  return predicate(&KRDBFilteredImagesFetchRequest::exivAttributesPredicate_,
+                   &KRDBFilteredImagesFetchRequest::exivAttributesCondition, exivAttributesColumnKeyPaths(),
+                   nullptr);
 }
 
 void KRDBFilteredImagesFetchRequest::setWherePredicate(KRPredicatePtr predicate) {

@@ -82,9 +82,10 @@ class KRDBFilteredImagesFetchRequest final : public KRDBFilteredEntitiesFetchReq
 
  private:
   using PredicateSlot = KRPredicatePtr KRDBFilteredImagesFetchRequest::*;
+  using ConditionGetter = KRString (KRDBFilteredImagesFetchRequest::*)() const;
 
-  // The cached predicate of the slot, made from the condition when there is none.
-  KRPredicatePtr predicate(PredicateSlot slot, const KRString& condition, const ColumnKeyPaths& columns,
+  // The cached predicate of the slot, made from the getter's condition when there is none.
+  KRPredicatePtr predicate(PredicateSlot slot, ConditionGetter conditionGetter, const ColumnKeyPaths& columns,
                            const char* prefix);
   void storePredicate(PredicateSlot slot, KRPredicatePtr predicate);
   template <class T>

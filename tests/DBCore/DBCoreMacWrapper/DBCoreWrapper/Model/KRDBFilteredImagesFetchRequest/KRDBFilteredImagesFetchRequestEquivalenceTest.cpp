@@ -468,6 +468,25 @@ TEST_F(KRDBFilteredImagesFetchRequestEquivalenceTest, TheIdentifierKeyPathIsUnkn
   EXPECT_EQ(fetched({.image = "_id_int_64 <= 20"}), idAtMost(20));
 }
 
+// The column functions are the engine's sub-selects over the whole table; the predicate syntax has no
+// such function, so the rewritten condition does not parse and the in-memory test answers no.
+TEST_F(KRDBFilteredImagesFetchRequestEquivalenceTest, ColumnFunctionsSelectOnlyInTheEngine) {
+  float largest = 0;
+  for (const auto& image : shared->images)
+    largest = std::max(largest, image->exivAttributesPrimitive()->isoSpeed());
+  const Setting maximum{.exif = "iso_speed == max_from_column(iso_speed)"};
+  const Ids atMaximum = where(
+      [largest](const ImagePtr& image) { return image->exivAttributesPrimitive()->isoSpeed() == largest; });
+  ASSERT_FALSE(atMaximum.empty());
+  EXPECT_EQ(fetched(maximum), atMaximum);
+  EXPECT_EQ(satisfying(maximum), Ids{});
+  const Setting minimum{.image = "import_index <= min_from_column(import_index)"};
+  const Ids first = where([](const ImagePtr& image) { return image->importIndex() == 0; });
+  ASSERT_FALSE(first.empty());
+  EXPECT_EQ(fetched(minimum), first);
+  EXPECT_EQ(satisfying(minimum), Ids{});
+}
+
 // Without an image condition the in-memory test does not look at the marked-to-delete flag; the engine
 // never selects a marked image.
 TEST_F(KRDBFilteredImagesFetchRequestEquivalenceTest, OnlyAnImageConditionExcludesMarkedImagesInMemory) {

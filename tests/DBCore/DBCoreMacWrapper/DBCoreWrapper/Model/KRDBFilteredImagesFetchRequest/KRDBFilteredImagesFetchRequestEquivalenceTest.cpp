@@ -54,6 +54,7 @@ const CameraModel kCameras[] = {
     {"Sony", "A7 III", "ILCE-7M3"},      {"Fujifilm", "X-T4", "X-T4"},
     {"Olympus", "E-M1", "E-M1MarkII"},   {"Apple", "iPhone 12", "iPhone 12 Pro"},
 };
+// One lens name holds "false", so that literals drawn from it are rewritten in the predicate text.
 const std::pair<const char*, const char*> kLenses[] = {{"Sigma", "24-70mm F2.8"},
                                                        {"Canon", "EF 50mm f/1.8"},
                                                        {"Nikon", "Z 85mm f/1.8 S"},
@@ -65,7 +66,8 @@ const float kShutterSpeeds[] = {0.00025f, 0.001f, 0.004f, 0.008f, 0.0166667f, 0.
 
 // The catalog of the suite and its images as fetched and linked, one entity per record (as a context
 // holds them): every image with its attributes, exif attributes and folder path, every path with its
-// volume, every collection with its images. Built once on the test thread, then read only.
+// volume, every collection with its images. Built once on the test thread, then only read (the in-memory
+// test may read it from another thread).
 class KREquivalenceCatalog {
  public:
   KREquivalenceCatalog() {

@@ -489,6 +489,20 @@ TEST_F(KRDBFilteredImagesFetchRequestEquivalenceTest, ColumnFunctionsSelectOnlyI
   EXPECT_EQ(satisfying(minimum), Ids{});
 }
 
+// The engine rejects a comparison of two columns of different types and then selects nothing; the
+// predicate compares the two values and answers per image (a number never equals a text, so "!=" holds).
+TEST_F(KRDBFilteredImagesFetchRequestEquivalenceTest, ColumnsOfDifferentTypesAreRejectedOnlyByTheEngine) {
+  const Ids every = where([](const ImagePtr&) { return true; });
+  for (const Setting& setting : {Setting{.image = "file_size_int_64 != path_wide_ch"},
+                                 Setting{.exif = "camera_maker_wide_ch != iso_speed || iso_speed > 100"}}) {
+    EXPECT_EQ(fetched(setting), Ids{}) << setting.description();
+    EXPECT_EQ(satisfying(setting), every) << setting.description();
+  }
+  const Setting equal{.image = "file_size_int_64 == path_wide_ch"};
+  EXPECT_EQ(fetched(equal), Ids{});
+  EXPECT_EQ(satisfying(equal), Ids{});
+}
+
 // Without an image condition the in-memory test does not look at the marked-to-delete flag; the engine
 // never selects a marked image.
 TEST_F(KRDBFilteredImagesFetchRequestEquivalenceTest, OnlyAnImageConditionExcludesMarkedImagesInMemory) {

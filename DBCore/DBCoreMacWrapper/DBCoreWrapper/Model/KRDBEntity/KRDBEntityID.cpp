@@ -3,6 +3,7 @@
 #include <array>
 
 #include "KRClasses/KRComposedHashValues.hpp"
+#include "KRFoundation/KRValue.hpp"
 
 namespace {
 
@@ -34,4 +35,10 @@ std::shared_ptr<KRDBEntityID> KRDBEntityID::copyWithZone() const {
 
 std::string KRDBEntityID::description() const {
   return "<" + defaultDescription() + ": " + std::to_string(entityType_) + "_" + std::to_string(dbid_) + ">";
+}
+
+KRValue KRDBEntityID::valueForKey(const std::string& key) const {
+  if (key == "dbid") return dbid_;
+  if (key == "entityType") return entityType_;
+  return KRObject::valueForKey(key);
 }

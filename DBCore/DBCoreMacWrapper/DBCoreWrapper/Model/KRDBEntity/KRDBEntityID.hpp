@@ -24,6 +24,8 @@ class KRDBEntityID : public KRObject {
   std::shared_ptr<KRDBEntityID> copyWithZone() const;
   // The default description, the type and the dbid: "<<KRDBEntityID: 0x...>: 1_42>".
   std::string description() const override;
+  // "entityType" and "dbid" are readable by key, so predicates may name "entityID.dbid".
+  KRValue valueForKey(const std::string& key) const override;
 
  protected:
   KRDBEntityID(int64_t entityType, int64_t databaseID);

@@ -8,6 +8,8 @@
 
 #include "KRClasses/KRComposedHashValues.hpp"
 #include "KRFoundation/KRError.hpp"
+#include "KRFoundation/KRException.hpp"
+#include "KRFoundation/KRValue.hpp"
 
 namespace {
 
@@ -91,6 +93,17 @@ TEST(KRDBEntityIDTest, DescriptionNamesTheObjectThenTypeAndDatabaseID) {
 TEST(KRDBEntityIDTest, DescriptionPrintsNegativeValuesWithAMinus) {
   const auto entityID = KRDBEntityID::initWithEntityType(-3, -42);
   EXPECT_EQ(entityID->description(), "<" + entityID->defaultDescription() + ": -3_-42>");
+}
+
+TEST(KRDBEntityIDTest, AnswersTypeAndDatabaseIDByKey) {
+  const auto entityID = KRDBEntityID::initWithEntityType(3, 1234567890123);
+  EXPECT_EQ(entityID->valueForKey("dbid").number().longLongValue(), 1234567890123);
+  EXPECT_EQ(entityID->valueForKey("entityType").number().longLongValue(), 3);
+}
+
+TEST(KRDBEntityIDTest, OtherKeysRaiseTheUnknownKeyException) {
+  const auto entityID = KRDBEntityID::initWithEntityType(3, 4);
+  EXPECT_THROW(entityID->valueForKey("hash"), KRException);
 }
 
 }  // namespace

@@ -524,8 +524,8 @@ TEST_F(KRDBFilteredImagesFetchRequestEquivalenceTest, OnlyAnImageConditionExclud
 // Random request settings over the catalog's own values. Each is made twice: as written, and with its
 // text literals as the in-memory test reads them (rewritten like the predicate text). The engine selects
 // from the second what the in-memory test accepts from the first; where no literal is rewritten the two
-// are the same setting. Numeric literals are written as the engine's 32-bit float parse reads them back exactly (see
-// LiteralsAreConvertedAsTheEngineConvertsThem). Single thread.
+// are the same setting. Numeric literals are written as the engine's 32-bit float parse reads them back
+// exactly (see LiteralsAreConvertedAsTheEngineConvertsThem). Single thread.
 class KRConditionGenerator {
  public:
   struct Generated {

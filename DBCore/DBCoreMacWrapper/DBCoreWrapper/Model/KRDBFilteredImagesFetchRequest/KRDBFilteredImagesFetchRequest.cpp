@@ -56,6 +56,12 @@ bool sameObject(const std::shared_ptr<T>& a, const std::shared_ptr<T>& b) {
 }
 bool sameObject(const KRDictionary& a, const KRDictionary& b) { return identical(a, b); }
 
+// Whether the engine makes a clause of the condition over T's table (joined or not gives the same answer).
+template <class T>
+bool engineAccepts(const std::string& condition) {
+  return !dbcore::clauseWithCondition<T>(condition, false).empty();
+}
+
 bool evaluates(const KRPredicatePtr& predicate, const KRValue& object) {
   return predicate->evaluateWithObject(object);
 }
@@ -245,26 +251,27 @@ std::string KRDBFilteredImagesFetchRequest::predicateFormatWithCondition(const s
   return text;
 }
 
-KRPredicatePtr KRDBFilteredImagesFetchRequest::predicate(PredicateSlot slot, ConditionGetter conditionGetter,
-                                                         const ColumnKeyPaths& columns, const char* prefix) {
+KRPredicatePtr KRDBFilteredImagesFetchRequest::predicate(const PredicateSource& source) {
   {
     const std::lock_guard lock(predicatesMutex_);
-    if (this->*slot) return this->*slot;
+    if (this->*source.slot) return this->*source.slot;
   }
   // The condition is prepared only when the predicate is made: the in-memory test asks for the cached
   // predicates on every entity.
-  const KRString condition = (this->*conditionGetter)();
+  const KRString condition = (this->*source.condition)();
   KRPredicatePtr made;
   if (condition.empty()) {
     made = KRPredicate::predicateWithValue(true);
+  } else if (!source.engineAccepts(condition.str())) {
+    made = KRPredicate::predicateWithValue(false);
   } else {
-    std::string format = predicateFormatWithCondition(condition.str(), columns);
-    if (prefix) format = std::string(prefix) + " && " + format;
+    std::string format = predicateFormatWithCondition(condition.str(), source.columns);
+    if (source.prefix) format = std::string(source.prefix) + " && " + format;
     made = KRPredicate::predicateWithFormat(format);
   }
   const std::lock_guard lock(predicatesMutex_);
-  if (!(this->*slot)) this->*slot = std::move(made);
-  return this->*slot;
+  if (!(this->*source.slot)) this->*source.slot = std::move(made);
+  return this->*source.slot;
 }
 
 void KRDBFilteredImagesFetchRequest::storePredicate(PredicateSlot slot, KRPredicatePtr predicate) {
@@ -273,21 +280,21 @@ void KRDBFilteredImagesFetchRequest::storePredicate(PredicateSlot slot, KRPredic
 }
 
 KRPredicatePtr KRDBFilteredImagesFetchRequest::wherePredicate() {
-  return predicate(&KRDBFilteredImagesFetchRequest::wherePredicate_,
-                   &KRDBFilteredImagesFetchRequest::imageCondition, imageColumnKeyPaths(),
-                   kNotMarkedToDeletePredicate);
+  return predicate({&KRDBFilteredImagesFetchRequest::wherePredicate_,
+                    &KRDBFilteredImagesFetchRequest::imageCondition, imageColumnKeyPaths(),
+                    kNotMarkedToDeletePredicate, &engineAccepts<dbcore::DBImage>});
 }
 
 KRPredicatePtr KRDBFilteredImagesFetchRequest::userAttributesPredicate() {
-  return predicate(&KRDBFilteredImagesFetchRequest::userAttributesPredicate_,
-                   &KRDBFilteredImagesFetchRequest::userAttributesCondition, userAttributesColumnKeyPaths(),
-                   nullptr);
+  return predicate({&KRDBFilteredImagesFetchRequest::userAttributesPredicate_,
+                    &KRDBFilteredImagesFetchRequest::userAttributesCondition, userAttributesColumnKeyPaths(),
+                    nullptr, &engineAccepts<dbcore::DBUserImgAttrib>});
 }
 
 KRPredicatePtr KRDBFilteredImagesFetchRequest::exivAttributesPredicate() {
-  return predicate(&KRDBFilteredImagesFetchRequest::exivAttributesPredicate_,
-                   &KRDBFilteredImagesFetchRequest::exivAttributesCondition, exivAttributesColumnKeyPaths(),
-                   nullptr);
+  return predicate({&KRDBFilteredImagesFetchRequest::exivAttributesPredicate_,
+                    &KRDBFilteredImagesFetchRequest::exivAttributesCondition, exivAttributesColumnKeyPaths(),
+                    nullptr, &engineAccepts<dbcore::DBExivImgAttrib>});
 }
 
 void KRDBFilteredImagesFetchRequest::setWherePredicate(KRPredicatePtr predicate) {

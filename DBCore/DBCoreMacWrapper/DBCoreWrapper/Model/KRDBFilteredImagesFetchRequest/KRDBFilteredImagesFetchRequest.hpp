@@ -83,10 +83,19 @@ class KRDBFilteredImagesFetchRequest final : public KRDBFilteredEntitiesFetchReq
  private:
   using PredicateSlot = KRPredicatePtr KRDBFilteredImagesFetchRequest::*;
   using ConditionGetter = KRString (KRDBFilteredImagesFetchRequest::*)() const;
+  // Where one predicate comes from: its cache slot, its condition, the column table that rewrites it,
+  // an optional predicate put before it, and whether the engine accepts the condition for its table.
+  struct PredicateSource {
+    PredicateSlot slot;
+    ConditionGetter condition;
+    const ColumnKeyPaths& columns;
+    const char* prefix;
+    bool (*engineAccepts)(const std::string& condition);
+  };
 
-  // The cached predicate of the slot, made from the getter's condition when there is none.
-  KRPredicatePtr predicate(PredicateSlot slot, ConditionGetter conditionGetter, const ColumnKeyPaths& columns,
-                           const char* prefix);
+  // The cached predicate of the source's slot, made from its condition when there is none. A condition
+  // the engine rejects (and so selects nothing with) makes a predicate that accepts nothing.
+  KRPredicatePtr predicate(const PredicateSource& source);
   void storePredicate(PredicateSlot slot, KRPredicatePtr predicate);
   template <class T>
   void replaceSetting(T& field, T value);

@@ -481,6 +481,18 @@ TEST_F(KRDBEntitiesFilterTest, ResetDuringAnObtainServesQueuedHandlersAtOnceWith
   EXPECT_EQ(observer->names(), (std::vector<std::string>{"reset"}));
 }
 
+TEST_F(KRDBEntitiesFilterTest, SortedHandlersWaitingWhenAResetInterruptsTheObtainReceiveAnAbsentArray) {
+  filter->setComparator(byDbidDescending());
+  std::vector<EntityArrayPtr> given;
+  filter->obtainSortedEntities([&given](const EntityArrayPtr& array) { given.push_back(array); });
+  filter->reset();
+  ASSERT_EQ(given.size(), 1u);
+  EXPECT_EQ(given[0], nullptr);
+  EXPECT_FALSE(filter->waitingForSortedEntities());
+  EXPECT_TRUE(filter->obtainSortedEntitiesHandlers().empty());
+  EXPECT_EQ(filter->sortedEntities(), nullptr);
+}
+
 TEST_F(KRDBEntitiesFilterTest, AnObtainEndingAfterAResetAppliesPendingChangesDropsTheListsAndObtainsNoMore) {
   filter->obtainEntities(nullptr);
   filter->reset();

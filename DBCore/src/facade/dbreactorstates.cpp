@@ -24,6 +24,7 @@ template <>
 std::map<long long, std::shared_ptr<DBImgHistoryState>>
 DBReactor::GetCurrentStates<DBImage, DBImgHistoryState>(
     std::vector<std::shared_ptr<DBImage>> const& images) const {
+  if (images.empty()) return DBStates::allCurrentStates(connection());
   std::map<long long, std::shared_ptr<DBImgHistoryState>> current;
   for (const auto& image : images) {
     if (!image) continue;

@@ -23,6 +23,15 @@ int64_t nextPosition(DBConnection& connection, int64_t imageId) {
   return statement->step() ? statement->columnInt64(0) : 0;
 }
 
+// The state columns followed by the id of the image whose current state the row is.
+std::string currentStatesSql() {
+  std::string sql = DBRecordIO::selectSql<DBImgHistoryState>();
+  sql.insert(sql.find(" FROM "), ", image_states.image_id");
+  return sql +
+         " JOIN image_states ON image_states.state_id = image_history_states._id_int_64"
+         " WHERE image_states.is_current = 1";
+}
+
 }  // namespace
 
 std::vector<std::shared_ptr<DBImgHistoryState>> DBStates::states(DBConnection& connection, int64_t imageId) {
@@ -37,6 +46,16 @@ std::shared_ptr<DBImgHistoryState> DBStates::currentState(DBConnection& connecti
   const DBStatementLease statement = connection.prepare(kSql);
   statement->bind(1, imageId);
   return DBRecordIO::readOne<DBImgHistoryState>(*statement);
+}
+
+std::map<long long, std::shared_ptr<DBImgHistoryState>> DBStates::allCurrentStates(DBConnection& connection) {
+  static const DBStaticSql kSql(currentStatesSql());
+  const DBStatementLease statement = connection.prepare(kSql);
+  const int imageColumn = static_cast<int>(DBImgHistoryState::all_columns().size());
+  std::map<long long, std::shared_ptr<DBImgHistoryState>> current;
+  while (statement->step())
+    current.emplace(statement->columnInt64(imageColumn), DBRecordIO::read<DBImgHistoryState>(*statement));
+  return current;
 }
 
 void DBStates::setCurrent(DBConnection& connection, int64_t imageId,

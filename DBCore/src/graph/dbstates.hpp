@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <map>
 #include <memory>
 #include <string>
 #include <vector>
@@ -16,6 +17,8 @@ class DBStates {
  public:
   static std::vector<std::shared_ptr<DBImgHistoryState>> states(DBConnection& connection, int64_t imageId);
   static std::shared_ptr<DBImgHistoryState> currentState(DBConnection& connection, int64_t imageId);
+  // The current state of every image that has one, by image id, in one query.
+  static std::map<long long, std::shared_ptr<DBImgHistoryState>> allCurrentStates(DBConnection& connection);
   // Makes the state current, appending it to the image's list when it is not there yet (an unsaved state
   // is written first); an empty state leaves the image without a current state.
   static void setCurrent(DBConnection& connection, int64_t imageId,

@@ -159,7 +159,7 @@ class DBReactor {
   void Remove(std::vector<std::shared_ptr<T>> const& records);
 
   // History states. SetStatesByVector takes, per image, its states in order and the position of the
-  // current one in that list (-1: none).
+  // current one in that list (-1: none). GetCurrentStates of no images answers every image's current state.
   template <class I, class S>
   requires DBImageStates<I, S> std::vector<std::shared_ptr<S>> GetStates(std::shared_ptr<I> const& image);
   template <class I, class S>

@@ -252,6 +252,9 @@ TEST_F(DBReactorRelationsTest, StatesByVectorAndCurrentState) {
   const auto current = reactor->GetCurrentStates<DBImage, DBImgHistoryState>({image, makeImage(L"b.jpg")});
   ASSERT_EQ(current.size(), 1u);
   EXPECT_EQ(current.at(image->id())->id(), states[2]->id());
+  const auto every = reactor->GetCurrentStates<DBImage, DBImgHistoryState>({});
+  ASSERT_EQ(every.size(), 1u);
+  EXPECT_EQ(every.at(image->id())->id(), states[2]->id());
 }
 
 TEST_F(DBReactorRelationsTest, SettingACurrentStateOutsideTheListAppendsIt) {

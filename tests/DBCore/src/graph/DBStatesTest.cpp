@@ -125,3 +125,22 @@ TEST_F(DBStatesTest, CopyResourcesAddsTheBaseStatesResources) {
   EXPECT_EQ(resourcesOf(base).size(), 2u);
   EXPECT_EQ(connection->queryInt64("SELECT count(*) FROM history_resources"), 3);
 }
+
+TEST_F(DBStatesTest, AllCurrentStatesHoldEveryImageWithACurrentStateOnly) {
+  const int64_t other = saved(DBImage())->id();
+  const int64_t without = saved(DBImage())->id();
+  StateList list = unsavedStates(2);
+  DBStates::replace(*connection, imageId, list, 1);
+  StateList otherList = unsavedStates(1);
+  DBStates::replace(*connection, other, otherList, 0);
+  DBStates::replace(*connection, without, unsavedStates(1), -1);
+  const auto current = DBStates::allCurrentStates(*connection);
+  ASSERT_EQ(current.size(), 2u);
+  EXPECT_EQ(current.at(imageId)->id(), list[1]->id());
+  EXPECT_EQ(current.at(imageId)->action_name, L"step 1");
+  EXPECT_EQ(current.at(other)->id(), otherList[0]->id());
+}
+
+TEST_F(DBStatesTest, AllCurrentStatesOfAnEmptyCatalogAreNone) {
+  EXPECT_TRUE(DBStates::allCurrentStates(*connection).empty());
+}

@@ -212,6 +212,7 @@ class KRDBCatalog : public KRAbstractModel {
   void fetchCurrentStateForImage(const std::shared_ptr<KRDBImage>& image,
                                  ResultHandler<std::shared_ptr<KRDBImageState>> handler, bool sync);
   std::shared_ptr<KRDBImageState> fetchCurrentStateForImage(const std::shared_ptr<KRDBImage>& image);
+  // The current states of the images, or of every image for none.
   void fetchCurrentStatesForImages(const KRDBEntityArray& images, ResultHandler<ImageStatesByID> handler,
                                    bool sync);
   // Each image gets its states in order and the position of its current one among them (-1 when it is not

@@ -1,0 +1,174 @@
+#include "Model/KRDBContext/KRDBAdditionalFetchForImagesService.hpp"
+
+#include <utility>
+
+#include "Model/KRDBContext/KRDBContext.hpp"
+#include "Model/KRDBEntity/KRDBEntityType.hpp"
+#include "Model/KRDBFilteredImageAttributesFetchRequest/KRDBFilteredImageAttributesFetchRequest.hpp"
+#include "Model/KRDBFilteredImageExivAttributesFetchRequest/KRDBFilteredImageExivAttributesFetchRequest.hpp"
+#include "Model/KRDBFilteredPathsFetchRequest/KRDBFilteredPathsFetchRequest.hpp"
+#include "Model/KRDBImage/KRDBImage.hpp"
+#include "Model/KRDBImageAttributes/KRDBImageAttributes.hpp"
+#include "Model/KRDBImageExivAttributes/KRDBImageExivAttributes.hpp"
+#include "Model/KRDBImageState/KRDBImageState.hpp"
+#include "Model/KRDBPath/KRDBPath.hpp"
+
+namespace {
+
+// The entry of the map under the key, or nil.
+template <class Map>
+typename Map::mapped_type entryOf(const Map& map, int64_t key) {
+  const auto found = map.find(key);
+  return found == map.end() ? typename Map::mapped_type{} : found->second;
+}
+
+// Attribute entities by the image id of their records.
+template <class Entity, class Map>
+Map byImageID(const KRDBEntitySet& entities, auto record) {
+  Map map;
+  map.reserve(entities.size());
+  for (const auto& entity : entities) {
+    const auto typed = std::static_pointer_cast<Entity>(entity);
+    if (const auto held = ((*typed).*record)()) map.emplace(held->image_id, typed);
+  }
+  return map;
+}
+
+}  // namespace
+
+std::shared_ptr<KRDBAdditionalFetchForImagesService> KRDBAdditionalFetchForImagesService::initWithContext(
+    const std::shared_ptr<KRDBContext>& context) {
+  std::shared_ptr<KRDBAdditionalFetchForImagesService> service(new KRDBAdditionalFetchForImagesService());
+  service->context_ = context;
+  return service;
+}
+
+void KRDBAdditionalFetchForImagesService::fastAdditionalFetchesForImage(
+    const std::shared_ptr<KRDBImage>& image, Handler handler) {
+  if (!handler) return;
+  if (allFetchesCompleted()) {
+    fastAdditionalFetchesForImage(image);
+    return handler();
+  }
+  if (!fastFetchingCompletions_) fastFetchingCompletions_ = std::make_unique<std::vector<Handler>>();
+  fastFetchingCompletions_->push_back([weak = weakSelf(), image, handler = std::move(handler)] {
+    if (const auto service = weak.lock()) service->fastAdditionalFetchesForImage(image);
+    handler();
+  });
+  requestFetchingMaps();
+}
+
+void KRDBAdditionalFetchForImagesService::fastAdditionalFetchesForImage(
+    const std::shared_ptr<KRDBImage>& image) {
+  if (!image || !allFetchesCompleted()) return;
+  const int64_t imageID = image->entityID()->dbid();
+  attachPath(image, imageID);
+  if (const auto attributes = entryOf(*imagesImageAttributesMap_, imageID)) {
+    attributes->setImagePrimitive(image);
+    image->setAttributesPrimitive(attributes);
+  }
+  if (const auto attributes = entryOf(*imagesImageExivAttributesMap_, imageID)) {
+    attributes->setImagePrimitive(image);
+    image->setExivAttributesPrimitive(attributes);
+  }
+  if (const auto state = entryOf(*imagesCurrentStatesMap_, imageID)) image->setCurrentStatePrimitive(state);
+}
+
+void KRDBAdditionalFetchForImagesService::attachPath(const std::shared_ptr<KRDBImage>& image,
+                                                     int64_t imageID) {
+  const auto found = imagesPathesMap_->find(imageID);
+  const auto context = context_.lock();
+  if (found == imagesPathesMap_->end() || !context) return;
+  const auto path =
+      context->entityWithID(KRDBEntityID::initWithEntityType(KRDBEntityTypePath, found->second));
+  image->setFolderDBPathPrimitive(std::static_pointer_cast<KRDBPath>(path));
+}
+
+// ---- Maps
+
+void KRDBAdditionalFetchForImagesService::requestFetchingMaps() {
+  const auto context = context_.lock();
+  if (fetchingMaps_ || !context) return;
+  fetchingMaps_ = true;
+  fetchPathesMap(context);
+  fetchAttributesMap(context);
+  fetchExivAttributesMap(context);
+  fetchCurrentStatesMap(context);
+}
+
+template <class Result>
+std::function<void(Result)> KRDBAdditionalFetchForImagesService::storing(
+    void (KRDBAdditionalFetchForImagesService::*store)(Result)) {
+  return [weak = weakSelf(), store](Result result) {
+    const auto service = weak.lock();
+    if (!service) return;
+    ((*service).*store)(std::move(result));
+    service->validateCompletionFetching();
+  };
+}
+
+void KRDBAdditionalFetchForImagesService::fetchPathesMap(const std::shared_ptr<KRDBContext>& context) {
+  std::weak_ptr<KRDBContext> weakContext = context;
+  const auto store = storing(&KRDBAdditionalFetchForImagesService::storePathes);
+  context->catalog()->fetchConnectionsForImagesWithDBPathesWithHandler(
+      [weakContext, store](KRDictionary connections) {
+        const auto context = weakContext.lock();
+        if (!context) return;
+        // Folder paths are not fetched by identifier: they are cached first, so that attaching an image's
+        // path finds it in the context's cache.
+        context->obtainEntitiesUsingFetchRequest(KRDBFilteredPathsFetchRequest::init(),
+                                                 [store, connections](KRDBEntitySet) { store(connections); });
+      });
+}
+
+void KRDBAdditionalFetchForImagesService::fetchAttributesMap(const std::shared_ptr<KRDBContext>& context) {
+  context->obtainEntitiesUsingFetchRequest(KRDBFilteredImageAttributesFetchRequest::init(),
+                                           storing(&KRDBAdditionalFetchForImagesService::storeAttributes));
+}
+
+void KRDBAdditionalFetchForImagesService::fetchExivAttributesMap(
+    const std::shared_ptr<KRDBContext>& context) {
+  context->obtainEntitiesUsingFetchRequest(
+      KRDBFilteredImageExivAttributesFetchRequest::init(),
+      storing(&KRDBAdditionalFetchForImagesService::storeExivAttributes));
+}
+
+void KRDBAdditionalFetchForImagesService::fetchCurrentStatesMap(const std::shared_ptr<KRDBContext>& context) {
+  context->obtainCurrentStatesForImages({},
+                                        storing(&KRDBAdditionalFetchForImagesService::storeCurrentStates));
+}
+
+void KRDBAdditionalFetchForImagesService::storePathes(KRDictionary connections) {
+  PathIDs pathIDs;
+  pathIDs.reserve(connections.count());
+  for (const auto& [image, path] : connections.entries())
+    pathIDs.emplace(image.number().longLongValue(), path.number().longLongValue());
+  imagesPathesMap_ = std::move(pathIDs);
+}
+
+void KRDBAdditionalFetchForImagesService::storeAttributes(KRDBEntitySet entities) {
+  imagesImageAttributesMap_ =
+      byImageID<KRDBImageAttributes, AttributesByImage>(entities, &KRDBImageAttributes::dbattrib);
+}
+
+void KRDBAdditionalFetchForImagesService::storeExivAttributes(KRDBEntitySet entities) {
+  imagesImageExivAttributesMap_ = byImageID<KRDBImageExivAttributes, ExivAttributesByImage>(
+      entities, &KRDBImageExivAttributes::dbexivattrib);
+}
+
+void KRDBAdditionalFetchForImagesService::storeCurrentStates(KRDBCatalog::ImageStatesByID states) {
+  imagesCurrentStatesMap_ = std::move(states);
+}
+
+bool KRDBAdditionalFetchForImagesService::allFetchesCompleted() const {
+  return imagesPathesMap_ && imagesImageAttributesMap_ && imagesImageExivAttributesMap_ &&
+         imagesCurrentStatesMap_;
+}
+
+void KRDBAdditionalFetchForImagesService::validateCompletionFetching() {
+  if (!allFetchesCompleted()) return;
+  fetchingMaps_ = false;
+  const auto completions = std::move(fastFetchingCompletions_);
+  if (!completions) return;
+  for (const auto& completion : *completions) completion();
+}

@@ -1,0 +1,252 @@
+#include "Model/KRDBContext/KRDBContext.hpp"
+
+#include <utility>
+
+#include "KRFoundation/KRDate.hpp"
+#include "KRFoundation/KRRunLoop.hpp"
+#include "Model/KRDBCollection/KRDBCollection.hpp"
+#include "Model/KRDBContext/KRDBAdditionalFetchForImagesService.hpp"
+#include "Model/KRDBEntitiesFilter/KRDBEntitiesStorage.hpp"
+#include "Model/KRDBEntitiesFilter/KRDBImagesFilter.hpp"
+#include "Model/KRDBEntity/KRDBEntity.hpp"
+#include "Model/KRDBEntity/KRDBEntityType.hpp"
+#include "Model/KRDBFilteredImagesFetchRequest/KRDBFilteredImagesFetchRequest.hpp"
+#include "Model/KRDBImage/KRDBImage.hpp"
+#include "Model/KRDBReferencedFolder/KRDBReferencedFolder.hpp"
+#include "Support/KRDBCoreInjectorService.hpp"
+
+namespace {
+
+// The database id of the root collection and of the root referenced folder.
+constexpr int64_t kRootDatabaseID = 1;
+
+}  // namespace
+
+// ---- Construction
+
+KRDBContext::KRDBContext(std::shared_ptr<KRDBCatalog> catalog)
+    : blockDispatcher_(catalog->dispatcher()),
+      catalog_(std::move(catalog)),
+      fetchedEntities_(KRDBEntitiesStorage::init()),
+      entitiesChanges_(emptyEntitiesChangesMapTable()) {}
+
+std::shared_ptr<KRDBContext> KRDBContext::initWithCatalog(std::shared_ptr<KRDBCatalog> catalog) {
+  if (!catalog) return nullptr;
+  std::shared_ptr<KRDBContext> context(new KRDBContext(std::move(catalog)));
+  context->buildRootsAndServices();
+  return context;
+}
+
+KRDBContext::~KRDBContext() = default;
+
+void KRDBContext::buildRootsAndServices() {
+  rootFilter_ = std::dynamic_pointer_cast<KRDBCollection>(
+      entityWithID(KRDBEntityID::initWithEntityType(KRDBEntityTypeCollection, kRootDatabaseID)));
+  rootReferencedFolder_ = std::dynamic_pointer_cast<KRDBReferencedFolder>(
+      entityWithID(KRDBEntityID::initWithEntityType(KRDBEntityTypeReferencedFolder, kRootDatabaseID)));
+  allImagesFilter_ = KRDBImagesFilter::initWithContext(selfPtr(), KRDBFilteredImagesFetchRequest::init());
+  additionalFetchForImagesService_ = KRDBAdditionalFetchForImagesService::initWithContext(selfPtr());
+}
+
+std::shared_ptr<KRDBEntityIDMapTable> KRDBContext::emptyEntitiesChangesMapTable() {
+  KRDBCoreInjectorService::load();
+  return KRDBCoreInjectorService::resolveImplementationClassForProtocol<KRDBDataStorageCreating>()
+      ->makeMapTableWithObjectsMappedByEntityIDs();
+}
+
+// ---- Entity cache
+
+std::shared_ptr<KRDBEntity> KRDBContext::cachedEntityForEntityID(const KRDBEntityIDPtr& entityID) const {
+  return entityID ? fetchedEntities_->entityForID(entityID) : nullptr;
+}
+
+std::shared_ptr<KRDBEntity> KRDBContext::entityWithID(const KRDBEntityIDPtr& entityID) {
+  if (!entityID) return nullptr;
+  auto entity = cachedEntityForEntityID(entityID);
+  if (!entity) {
+    entity = catalog_->fetchEntityWithID(entityID);
+    if (!entity) return nullptr;
+    cacheEntityAndFetchLinkedEntities(entity);
+  }
+  waitForNecessaryEntities(entity);
+  return entity;
+}
+
+void KRDBContext::waitForNecessaryEntities(const std::shared_ptr<KRDBEntity>& entity) {
+  if (entity->necesserryEntitiesToFetchCount() == 0) return;
+  KRRunLoop::currentRunLoop()->runUntil([&entity] { return entity->necesserryEntitiesToFetchCount() == 0; },
+                                        KRDate::distantFuture());
+}
+
+void KRDBContext::cacheEntityAndFetchLinkedEntities(const std::shared_ptr<KRDBEntity>& entity) {
+  if (!entity || !entity->entityID() || cachedEntityForEntityID(entity->entityID())) return;
+  // Cached first, so that lookups made while its linked records are fetched find this object.
+  fetchedEntities_->setEntity(entity, entity->entityID());
+  if (entity->needFetchNecessaryEntities()) additionalFetchingForEntity(entity);
+  if (entity->necesserryEntitiesToFetchCount() == 0) return prepareFetchedEntity(entity);
+  std::weak_ptr<KRDBContext> weak = weakSelf();
+  entity->pushCompletionFetchingNecessaryEntities([weak, entity] {
+    if (const auto context = weak.lock()) context->prepareFetchedEntity(entity);
+  });
+}
+
+void KRDBContext::prepareFetchedEntity(const std::shared_ptr<KRDBEntity>& entity) {
+  if (!entity) return;
+  entity->addListener(selfPtr());
+  entity->setContext(selfPtr());
+  // The keys of the linked-entities dictionary, read one by one rather than through a dictionary built
+  // per entity.
+  for (const auto& key : entity->entityClass().necessaryLinkedEntitiesKeys()) {
+    const auto linked = entity->valueForKey(key).objectAs<KRDBEntity>();
+    if (!linked) continue;
+    auto instance = cachedEntityForEntityID(linked->entityID());
+    if (!instance) {
+      prepareFetchedEntity(linked);
+      instance = linked;
+    }
+    entity->updateNecessaryEntityForKey(key, instance);
+  }
+  entity->awakeFromFetch();
+  fetchedEntities_->setEntity(entity, entity->entityID());
+}
+
+std::shared_ptr<KRDBEntity> KRDBContext::cachedOrCachingInstance(const std::shared_ptr<KRDBEntity>& entity) {
+  if (auto cached = cachedEntityForEntityID(entity->entityID())) return cached;
+  cacheEntityAndFetchLinkedEntities(entity);
+  return entity;
+}
+
+std::shared_ptr<KRDBEntity> KRDBContext::preparedEntity(const std::shared_ptr<KRDBEntity>& entity) {
+  if (!entity) return nullptr;
+  auto instance = cachedOrCachingInstance(entity);
+  waitForNecessaryEntities(instance);
+  return instance;
+}
+
+void KRDBContext::preparedEntities(const KRDBEntitySet& entities, EntitiesHandler handler) {
+  struct Progress {
+    KRDBEntitySet result;
+    size_t finished = 0;
+    size_t expected = 0;
+    EntitiesHandler handler;
+    void finishOne() {
+      if (++finished == expected && handler) handler(std::move(result));
+    }
+  };
+  const auto progress = std::make_shared<Progress>();
+  progress->expected = entities.size();
+  progress->handler = std::move(handler);
+  progress->result.reserve(entities.size());
+  for (const auto& entity : entities) {
+    if (!entity) continue;
+    const auto instance = cachedOrCachingInstance(entity);
+    progress->result.insert(instance);
+    if (instance->necesserryEntitiesToFetchCount() != 0) {
+      instance->pushCompletionFetchingNecessaryEntities([progress] { progress->finishOne(); });
+    } else {
+      ++progress->finished;
+    }
+  }
+  if (progress->handler && progress->finished == progress->expected)
+    progress->handler(std::move(progress->result));
+}
+
+void KRDBContext::additionalFetchingForEntity(const std::shared_ptr<KRDBEntity>& entity) {
+  entity->setNecesserryEntitiesToFetchCount(entity->entityClass().necessaryLinkedEntitiesKeys().size());
+  std::weak_ptr<KRDBContext> weak = weakSelf();
+  makeFastAdditionalFetchesForEntity(entity, [weak, entity] {
+    const auto context = weak.lock();
+    if (!context) return;
+    if (!entity->needFetchNecessaryEntities()) return entity->setNecesserryEntitiesToFetchCount(0);
+    context->catalog_->additionalFetchingForEntities(
+        {entity},
+        [weak, entity](KRDBEntitySet linked) {
+          if (const auto context = weak.lock()) context->takeLinkedEntities(entity, linked);
+        },
+        false);
+  });
+}
+
+void KRDBContext::takeLinkedEntities(const std::shared_ptr<KRDBEntity>& entity, const KRDBEntitySet& linked) {
+  entity->setNecesserryEntitiesToFetchCount(linked.size());
+  const auto decrement = [entity] {
+    entity->setNecesserryEntitiesToFetchCount(entity->necesserryEntitiesToFetchCount() - 1);
+  };
+  for (const auto& each : linked) {
+    const auto instance = cachedOrCachingInstance(each);
+    if (instance->necesserryEntitiesToFetchCount() != 0) {
+      instance->pushCompletionFetchingNecessaryEntities(decrement);
+    } else {
+      decrement();
+    }
+  }
+}
+
+void KRDBContext::makeFastAdditionalFetchesForEntity(const std::shared_ptr<KRDBEntity>& entity,
+                                                     Handler completion) {
+  if (entity->entityID()->entityType() != KRDBEntityTypeImage) return completion();
+  additionalFetchForImagesService_->fastAdditionalFetchesForImage(std::static_pointer_cast<KRDBImage>(entity),
+                                                                  std::move(completion));
+}
+
+void KRDBContext::obtainEntitiesUsingFetchRequest(const FetchRequestPtr& request, EntitiesHandler handler) {
+  std::weak_ptr<KRDBContext> weak = weakSelf();
+  catalog_->obtainFetchedEntitiesUsingFetchRequest(
+      request,
+      [weak, handler = std::move(handler)](KRDBEntitySet entities) {
+        if (const auto context = weak.lock()) context->preparedEntities(entities, handler);
+      },
+      false);
+}
+
+// ---- Dispatcher, waiting, closing, backup
+
+void KRDBContext::performBlock(std::function<void()> block) {
+  blockDispatcher_->performBlock(std::move(block));
+}
+
+void KRDBContext::performBlockAndWait(const std::function<void()>& block) {
+  blockDispatcher_->performBlockAndWait(block);
+}
+
+void KRDBContext::enqueueWaitingBlock(Handler block) {
+  const std::lock_guard lock(waitForProcessChangesHandlersMutex_);
+  waitForProcessChangesHandlers_.push_back(std::move(block));
+}
+
+KRDBContext::Handler KRDBContext::dequeueWaitingChangesBlock() {
+  const std::lock_guard lock(waitForProcessChangesHandlersMutex_);
+  if (waitForProcessChangesHandlers_.empty()) return nullptr;
+  Handler first = std::move(waitForProcessChangesHandlers_.front());
+  waitForProcessChangesHandlers_.erase(waitForProcessChangesHandlers_.begin());
+  return first;
+}
+
+void KRDBContext::waitForProcessChangesWithHandler(Handler handler) {
+  if (isWaitingForProcessChanges()) return enqueueWaitingBlock(std::move(handler));
+  if (handler) handler();
+}
+
+void KRDBContext::waitForAllDataBaseOperationsWithHandler(Handler handler) {
+  waitForProcessChangesWithHandler([catalog = catalog_, handler = std::move(handler)] {
+    catalog->waitForAllDataBaseOperationsWithHandler(handler);
+  });
+}
+
+void KRDBContext::closeAfterAllDataBaseOperationsWithHandler(Handler handler) {
+  waitingForClose_ = true;
+  waitForProcessChangesWithHandler([catalog = catalog_, handler = std::move(handler)] {
+    catalog->closeAfterAllDataBaseOperationsWithHandler(handler);
+  });
+}
+
+void KRDBContext::backupDBToPath(const KRString& path, std::function<void(bool)> handler) {
+  waitForProcessChangesWithHandler([catalog = catalog_, path, handler = std::move(handler)] {
+    catalog->backupDBFileToPath(path, [handler](bool succeeded) { handler(succeeded); });
+  });
+}
+
+KRString KRDBContext::normilizedPath(const KRString& path) {
+  if (!path || path.str().ends_with('/')) return path;
+  return KRString(path.str() + "/");
+}

@@ -1,0 +1,185 @@
+#pragma once
+
+#include <cstdint>
+#include <functional>
+#include <memory>
+#include <mutex>
+#include <string>
+#include <vector>
+
+#include "KRClasses/KRAbstractModel.hpp"
+#include "KRClasses/KRBlockDispatcher.hpp"
+#include "KRFoundation/KRString.hpp"
+#include "KRFoundation/KRUndoManager.hpp"
+#include "Model/KRDBCatalog/KRDBCatalog.hpp"
+#include "Model/KRDBEntity/KRDBDataStorageCreating.hpp"
+#include "Model/KRDBEntity/KRDBEntityContext.hpp"
+#include "Model/KRDBFilteredEntitiesFetchRequest/KRDBFilteredEntitiesFetchRequest.hpp"
+
+class KRDBAdditionalFetchForImagesService;
+class KRDBCollection;
+class KRDBEntitiesFilter;
+class KRDBEntitiesStorage;
+class KRDBReferencedFolder;
+
+// The object graph over one open catalog: at most one live entity object per identifier. Every entity
+// that reaches the application (fetched by identifier, by request or as a linked record) passes through
+// the cache first, and is handed out only once the records it cannot be used without are attached.
+//
+// The context lives on the main thread: catalog results arrive there, and the cache, the preparation of
+// entities and the callbacks run there; the cache is not locked. entityWithID and preparedEntity turn the
+// calling thread's run loop until the linked records arrived, so they are called on the main thread. Only
+// the queue of callbacks waiting for a change-processing pass is locked, as any thread may add to it.
+class KRDBContext : public KRAbstractModel, public KRDBEntityContext, public KRDBClosingEntityContext {
+ public:
+  using Handler = std::function<void()>;
+  using EntitiesHandler = std::function<void(KRDBEntitySet)>;
+  using FetchRequestPtr = std::shared_ptr<KRDBFilteredEntitiesFetchRequest>;
+
+  // Builds the context over the catalog: the cache and the change sets, then the root collection and the
+  // root referenced folder (fetched at once), the all-images filter and the additional-fetch service.
+  static std::shared_ptr<KRDBContext> initWithCatalog(std::shared_ptr<KRDBCatalog> catalog);
+  ~KRDBContext() override;
+
+  // ---- State. waitingForProcessChanges: a change-processing pass is scheduled and has not finished;
+  // waitingForClose: set for good by closeAfterAllDataBaseOperationsWithHandler;
+  // waitingForResetValidationRecords: a reset of the validation records is scheduled.
+  bool isWaitingForProcessChanges() const { return waitingForProcessChanges_; }
+  void setWaitingForProcessChanges(bool waiting) { waitingForProcessChanges_ = waiting; }
+  bool isWaitingForClose() const override { return waitingForClose_; }
+  bool isWaitingForResetValidationRecords() const { return waitingForResetValidationRecords_; }
+  void setWaitingForResetValidationRecords(bool waiting) { waitingForResetValidationRecords_ = waiting; }
+  bool contextUndoGrouping() const { return contextUndoGrouping_; }
+  const std::shared_ptr<KRUndoManager>& undoManager() const { return undoManager_; }
+  const std::shared_ptr<KRBlockDispatcher>& blockDispatcher() const { return blockDispatcher_; }
+  const std::shared_ptr<KRDBCollection>& rootFilter() const { return rootFilter_; }
+  const std::shared_ptr<KRDBCatalog>& catalog() const { return catalog_; }
+  const std::shared_ptr<KRDBReferencedFolder>& rootReferencedFolder() const { return rootReferencedFolder_; }
+  const std::shared_ptr<KRDBEntitiesFilter>& allImagesFilter() const { return allImagesFilter_; }
+  const std::shared_ptr<KRDBEntitiesStorage>& fetchedEntities() const { return fetchedEntities_; }
+  KRDBEntitySet& addedEntities() { return addedEntities_; }
+  KRDBEntitySet& deletedEntities() { return deletedEntities_; }
+  KRDBEntitySet& updatedEntities() { return updatedEntities_; }
+  const std::shared_ptr<KRDBEntityIDMapTable>& entitiesChanges() const { return entitiesChanges_; }
+  KRDBEntitySet& entitiesWithValidationRecord() { return entitiesWithValidationRecord_; }
+  const std::shared_ptr<KRDBAdditionalFetchForImagesService>& additionalFetchForImagesService() const {
+    return additionalFetchForImagesService_;
+  }
+  // A new empty map keyed by entity identifiers of any type, from the storage factory.
+  static std::shared_ptr<KRDBEntityIDMapTable> emptyEntitiesChangesMapTable();
+
+  // ---- Entity cache
+  // The cached object of the identifier, or nil; never asks the catalog.
+  std::shared_ptr<KRDBEntity> cachedEntityForEntityID(const KRDBEntityIDPtr& entityID) const;
+  // The one object of the identifier with its linked records attached, fetched when not cached; nil when
+  // the catalog has no such record.
+  std::shared_ptr<KRDBEntity> entityWithID(const KRDBEntityIDPtr& entityID);
+  // Caches a freshly fetched entity (an entity already cached for its identifier wins and this one is
+  // dropped) and starts fetching its linked records; it is prepared once they are attached.
+  void cacheEntityAndFetchLinkedEntities(const std::shared_ptr<KRDBEntity>& entity);
+  // Attaches the entity to the context and its linked slots to the cached instances.
+  void prepareFetchedEntity(const std::shared_ptr<KRDBEntity>& entity);
+  // The cached instance for the entity's identifier (the entity itself when none), fully prepared.
+  std::shared_ptr<KRDBEntity> preparedEntity(const std::shared_ptr<KRDBEntity>& entity);
+  // The cached instances of the entities, handed over once all are prepared (at once for none).
+  void preparedEntities(const KRDBEntitySet& entities, EntitiesHandler handler);
+  // The linked-record fetch driver: the fast path for images, then the catalog for what is still missing.
+  void additionalFetchingForEntity(const std::shared_ptr<KRDBEntity>& entity);
+  void makeFastAdditionalFetchesForEntity(const std::shared_ptr<KRDBEntity>& entity, Handler completion);
+  // The request's entities as cached, prepared instances, on the main thread.
+  void obtainEntitiesUsingFetchRequest(const FetchRequestPtr& request, EntitiesHandler handler);
+
+  // ---- Dispatcher, waiting, closing, backup
+  void performBlock(std::function<void()> block);
+  void performBlockAndWait(const std::function<void()>& block);
+  void enqueueWaitingBlock(Handler block);
+  Handler dequeueWaitingChangesBlock();
+  // Calls the handler now when no change-processing pass is pending, else at the end of that pass.
+  void waitForProcessChangesWithHandler(Handler handler);
+  void waitForAllDataBaseOperationsWithHandler(Handler handler);
+  void closeAfterAllDataBaseOperationsWithHandler(Handler handler);
+  // The handler is required.
+  void backupDBToPath(const KRString& path, std::function<void(bool)> handler);
+  // The path with one "/" appended when it does not end in one; nil stays nil.
+  static KRString normilizedPath(const KRString& path);
+
+  // ---- Relations (KRDBContextRelations.cpp): the catalog's answers as cached, prepared instances
+  std::shared_ptr<KRDBEntityFavoriteAlias> favoriteAliasForEntity(
+      const std::shared_ptr<KRDBEntity>& entity) override;
+  std::shared_ptr<KRDBAbstractBaseFolder> parentOfFilter(
+      const std::shared_ptr<KRDBAbstractBaseFolder>& filter) override;
+  KRDBEntitySet childsOfFilter(const std::shared_ptr<KRDBAbstractBaseFolder>& filter) override;
+  void obtainChildsOfFilter(const std::shared_ptr<KRDBAbstractBaseFolder>& filter, EntitiesHandler handler);
+  void obtainDescendantsOfFilter(const std::shared_ptr<KRDBAbstractBaseFolder>& filter,
+                                 EntitiesHandler handler);
+  KRDBEntitySet imagesOfFilter(const std::shared_ptr<KRDBAbstractBaseFolder>& filter) override;
+  KRDBEntitySet filtersOfImage(const std::shared_ptr<KRDBImage>& image) override;
+  std::shared_ptr<KRDBImageAttributes> attributesForImage(const std::shared_ptr<KRDBImage>& image) override;
+  std::shared_ptr<KRDBImage> imageForAttributes(
+      const std::shared_ptr<KRDBImageAttributes>& attributes) override;
+  std::shared_ptr<KRDBImageExivAttributes> exivAttributesForImage(
+      const std::shared_ptr<KRDBImage>& image) override;
+  std::shared_ptr<KRDBImage> imageForExivAttributes(
+      const std::shared_ptr<KRDBImageExivAttributes>& attributes) override;
+  std::shared_ptr<KRDBPath> pathForReferencedFolder(
+      const std::shared_ptr<KRDBReferencedFolder>& folder) override;
+  KRDBImageStates statesForImage(const std::shared_ptr<KRDBImage>& image) override;
+  std::shared_ptr<KRDBImageState> currentStateForImage(const std::shared_ptr<KRDBImage>& image) override;
+  // No images means every image; the handler gets the current states by image id, as prepared instances.
+  void obtainCurrentStatesForImages(const KRDBEntityArray& images,
+                                    std::function<void(KRDBCatalog::ImageStatesByID)> handler);
+  std::shared_ptr<KRDBVolume> volumeForPath(const std::shared_ptr<KRDBPath>& path) override;
+
+  // ---- Graph changes (KRDBContextRelations.cpp). They come with change processing and undo; until then
+  // each logs an error and raises the unrecognised-operation exception.
+  void addChilds(const KRDBEntitySet& childs, const std::shared_ptr<KRDBAbstractBaseFolder>& filter) override;
+  void addImages(const KRDBEntitySet& images, const std::shared_ptr<KRDBAbstractBaseFolder>& filter) override;
+  void addImages(const KRDBEntitySet& images, const std::shared_ptr<KRDBReferencedFolder>& folder) override;
+  void deleteImages(const KRDBEntitySet& images,
+                    const std::shared_ptr<KRDBAbstractBaseFolder>& filter) override;
+  void setStates(const KRDBImageStates& states, const std::shared_ptr<KRDBImageState>& currentState,
+                 const std::shared_ptr<KRDBImage>& image) override;
+  void setCurrentState(const std::shared_ptr<KRDBImageState>& state,
+                       const std::shared_ptr<KRDBImage>& image) override;
+
+ private:
+  explicit KRDBContext(std::shared_ptr<KRDBCatalog> catalog);
+  void buildRootsAndServices();
+  std::shared_ptr<KRDBContext> selfPtr() { return std::static_pointer_cast<KRDBContext>(shared_from_this()); }
+  std::weak_ptr<KRDBContext> weakSelf() { return selfPtr(); }
+  // Turns the current run loop until the entity's linked records are attached.
+  static void waitForNecessaryEntities(const std::shared_ptr<KRDBEntity>& entity);
+  // The cached instance of an entity, caching (and starting the preparation of) the entity on a miss.
+  std::shared_ptr<KRDBEntity> cachedOrCachingInstance(const std::shared_ptr<KRDBEntity>& entity);
+  // Takes the linked records the catalog fetched for the entity: each is cached and the entity's count
+  // goes down as each is prepared.
+  void takeLinkedEntities(const std::shared_ptr<KRDBEntity>& entity, const KRDBEntitySet& linked);
+  // A catalog answer of one entity as its prepared instance.
+  template <class T>
+  std::shared_ptr<T> prepared(const std::shared_ptr<T>& entity);
+  KRDBEntitySet preparedSet(const KRDBEntitySet& entities);
+  [[noreturn]] void raiseGraphChangeUnavailable(const char* operation) const;
+
+  bool waitingForProcessChanges_ = false;
+  bool waitingForClose_ = false;
+  bool waitingForResetValidationRecords_ = false;
+  bool contextUndoGrouping_ = false;
+  std::shared_ptr<KRUndoManager> undoManager_;
+  std::shared_ptr<KRBlockDispatcher> blockDispatcher_;
+  std::shared_ptr<KRDBCollection> rootFilter_;
+  std::shared_ptr<KRDBCatalog> catalog_;
+  std::shared_ptr<KRDBReferencedFolder> rootReferencedFolder_;
+  std::shared_ptr<KRDBEntitiesFilter> allImagesFilter_;
+  std::shared_ptr<KRDBEntitiesStorage> fetchedEntities_;
+  KRDBEntitySet addedEntities_;
+  KRDBEntitySet deletedEntities_;
+  KRDBEntitySet updatedEntities_;
+  std::shared_ptr<KRDBEntityIDMapTable> entitiesChanges_;
+  KRDBEntitySet entitiesWithValidationRecord_;
+  // waitForProcessChangesHandlers: the callbacks waiting for the end of the pending pass, under their lock.
+  std::mutex waitForProcessChangesHandlersMutex_;
+  std::vector<Handler> waitForProcessChangesHandlers_;
+  std::shared_ptr<KRDBAdditionalFetchForImagesService> additionalFetchForImagesService_;
+};
+
+using KRDBContextPtr = std::shared_ptr<KRDBContext>;

@@ -50,6 +50,8 @@ class KRDBEntitiesChangesStorage : public KRObject {
   EntitySetPtr deletedEntities_;
   EntitySetPtr updatedEntities_;
   EntitiesChangesPtr entitiesChanges_;
+  // addedEntitiesFilteredByType, deletedEntitiesFilteredByType, updatedEntitiesFilteredByType: the subsets
+  // by entity type, under cacheMutex_.
   mutable std::mutex cacheMutex_;
   mutable TypeCache addedEntitiesFilteredByType_;
   mutable TypeCache deletedEntitiesFilteredByType_;

@@ -4,6 +4,7 @@
 #include <memory>
 #include <mutex>
 #include <string>
+#include <unordered_map>
 #include <vector>
 
 #include "KRFoundation/KRObject.hpp"
@@ -14,6 +15,8 @@
 // Observers are KRObjects that implement an observer interface (an abstract class whose methods have
 // empty default bodies). A notification names the interface method; each registered observer that
 // implements the interface gets the call, an observer that is gone or no longer registered is skipped.
+// Adding and finding an observer take constant time however many there are (a folder path observed by
+// every image in it), so registering n observers costs O(n).
 class KRAbstractModel : public KRObject {
  public:
   // Registers an observer once; adding it again changes nothing.
@@ -46,6 +49,24 @@ class KRAbstractModel : public KRObject {
   KRAbstractModel() = default;
 
  private:
+  // The position of each live observer, and the list size at which dead entries are dropped next.
+  struct Index {
+    std::unordered_map<const KRObject*, size_t> positions;
+    size_t pruneAt = 0;
+  };
+  static constexpr size_t kNotListed = static_cast<size_t>(-1);
+  // Lists longer than this get a position index; shorter ones are searched.
+  static constexpr size_t kIndexedListeners = 8;
+
+  // The position of the live entry for the object, or kNotListed. Called under the lock.
+  size_t positionOf(const KRObject* listener) const;
+  void eraseAt(size_t position);
+  // Drops the entries of observers that are gone: at every addition while the list is short, otherwise
+  // once it has doubled since the last time, so that dead entries cost amortised constant time.
+  void dropGoneListeners();
+  void rebuildPositions();
+
   mutable std::mutex mutex_;
   std::vector<std::weak_ptr<KRObject>> listeners_;
+  std::unique_ptr<Index> index_;
 };

@@ -110,6 +110,42 @@ TEST(KRAbstractModelTest, ObserverRemovedByAnEarlierOneIsNotCalled) {
   EXPECT_FALSE(model->hasListener(b));
 }
 
+// Past a few observers the list keeps a position index; order, duplicates, removal and dead observers
+// behave as for a short list.
+TEST(KRAbstractModelTest, ManyObserversKeepTheirOrderAndAreFoundAndRemoved) {
+  std::vector<std::string> log;
+  auto model = std::make_shared<Model>();
+  std::vector<std::shared_ptr<Recorder>> recorders;
+  for (int index = 0; index < 40; ++index) {
+    recorders.push_back(std::make_shared<Recorder>(std::to_string(index), &log));
+    model->addListener(recorders.back());
+    model->addListener(recorders.front());
+  }
+  EXPECT_EQ(model->listeners().size(), 40u);
+  model->removeListener(recorders[10]);
+  EXPECT_FALSE(model->hasListener(recorders[10]));
+  EXPECT_TRUE(model->hasListener(recorders[11]));
+  recorders[20].reset();
+  model->addListener(recorders[10]);
+  model->notifyObserversWithSelector(&ChangeObserver::modelDidChange, model.get(), KRDictionary{{"key", 8}});
+  std::vector<std::string> expected;
+  for (int index = 0; index < 40; ++index) {
+    if (index != 10 && index != 20) expected.push_back(std::to_string(index) + ":8");
+  }
+  expected.push_back("10:8");
+  EXPECT_EQ(log, expected);
+}
+
+TEST(KRAbstractModelTest, EntriesOfDeadObserversAreDroppedAsTheListGrows) {
+  auto model = std::make_shared<Model>();
+  std::vector<std::string> log;
+  auto kept = std::make_shared<Recorder>("kept", &log);
+  model->addListener(kept);
+  for (int index = 0; index < 1000; ++index) model->addListener(std::make_shared<Recorder>("gone", &log));
+  EXPECT_EQ(model->listeners(), (std::vector<std::shared_ptr<KRObject>>{kept}));
+  EXPECT_TRUE(model->hasListener(kept));
+}
+
 TEST(KRAbstractModelTest, NextIterationBlockRunsOnTheMainRunLoopLater) {
   auto model = std::make_shared<Model>();
   bool ran = false;

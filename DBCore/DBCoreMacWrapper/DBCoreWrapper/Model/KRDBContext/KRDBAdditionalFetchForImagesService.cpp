@@ -157,7 +157,7 @@ void KRDBAdditionalFetchForImagesService::storeExivAttributes(KRDBEntitySet enti
 }
 
 void KRDBAdditionalFetchForImagesService::storeCurrentStates(KRDBCatalog::ImageStatesByID states) {
-  imagesCurrentStatesMap_ = std::move(states);
+  imagesCurrentStatesMap_ = StatesByImage(states.begin(), states.end());
 }
 
 bool KRDBAdditionalFetchForImagesService::allFetchesCompleted() const {

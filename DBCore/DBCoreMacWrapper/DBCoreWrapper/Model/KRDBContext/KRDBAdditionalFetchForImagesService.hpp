@@ -14,18 +14,20 @@ class KRDBContext;
 class KRDBImage;
 class KRDBImageAttributes;
 class KRDBImageExivAttributes;
+class KRDBImageState;
 
 // Attaches to images their folder path, attributes, exif attributes and current history state from four
 // whole-catalog maps keyed by image database id, fetched once per context, instead of four queries per
-// image. Images asked for before the maps arrived wait in a queue and are served in order when the last
-// map arrives. The maps are never refreshed: images created later get their links the ordinary way.
-// Main thread only; not locked.
+// image. The maps are hash maps: each image is looked up in all four. Images asked for before the maps
+// arrived wait in a queue and are served in order when the last map arrives. The maps are never refreshed:
+// images created later get their links the ordinary way. Main thread only; not locked.
 class KRDBAdditionalFetchForImagesService : public KRObject {
  public:
   using Handler = std::function<void()>;
   using PathIDs = std::unordered_map<int64_t, int64_t>;
   using AttributesByImage = std::unordered_map<int64_t, std::shared_ptr<KRDBImageAttributes>>;
   using ExivAttributesByImage = std::unordered_map<int64_t, std::shared_ptr<KRDBImageExivAttributes>>;
+  using StatesByImage = std::unordered_map<int64_t, std::shared_ptr<KRDBImageState>>;
 
   static std::shared_ptr<KRDBAdditionalFetchForImagesService> initWithContext(
       const std::shared_ptr<KRDBContext>& context);
@@ -51,9 +53,7 @@ class KRDBAdditionalFetchForImagesService : public KRObject {
   const std::optional<ExivAttributesByImage>& imagesImageExivAttributesMap() const {
     return imagesImageExivAttributesMap_;
   }
-  const std::optional<KRDBCatalog::ImageStatesByID>& imagesCurrentStatesMap() const {
-    return imagesCurrentStatesMap_;
-  }
+  const std::optional<StatesByImage>& imagesCurrentStatesMap() const { return imagesCurrentStatesMap_; }
 
  private:
   KRDBAdditionalFetchForImagesService() = default;
@@ -81,6 +81,6 @@ class KRDBAdditionalFetchForImagesService : public KRObject {
   std::optional<PathIDs> imagesPathesMap_;
   std::optional<AttributesByImage> imagesImageAttributesMap_;
   std::optional<ExivAttributesByImage> imagesImageExivAttributesMap_;
-  std::optional<KRDBCatalog::ImageStatesByID> imagesCurrentStatesMap_;
+  std::optional<StatesByImage> imagesCurrentStatesMap_;
   std::unique_ptr<std::vector<Handler>> fastFetchingCompletions_;
 };

@@ -2,6 +2,7 @@
 
 #include "Model/KRDBImage/KRDBImage.hpp"
 #include "Model/KRDBImageExivAttributes/KRDBExifReader.hpp"
+#include "Support/KRDBInternedStrings.hpp"
 
 using dbcore::DBExivImgAttrib;
 
@@ -76,11 +77,12 @@ bool KRDBImageExivAttributes::storeInfoFromDBExivAttributes(
   load(whiteBalanceIndex_, record, &DBExivImgAttrib::white_balance_index);
   load(lightSource_, record, &DBExivImgAttrib::light_source);
   load(meteringMode_, record, &DBExivImgAttrib::metering_mode);
-  load(cameraMaker_, record, &DBExivImgAttrib::camera_maker);
-  load(cameraName_, record, &DBExivImgAttrib::camera_name);
-  load(cameraModel_, record, &DBExivImgAttrib::camera_model);
-  load(lensMaker_, record, &DBExivImgAttrib::lens_maker);
-  load(lensPrettyName_, record, &DBExivImgAttrib::lens_pretty_name);
+  // Camera and lens names repeat across a catalog: one shared string per name.
+  cameraMaker_ = KRDBInternedStrings::string(record.camera_maker);
+  cameraName_ = KRDBInternedStrings::string(record.camera_name);
+  cameraModel_ = KRDBInternedStrings::string(record.camera_model);
+  lensMaker_ = KRDBInternedStrings::string(record.lens_maker);
+  lensPrettyName_ = KRDBInternedStrings::string(record.lens_pretty_name);
   load(date_, record, &DBExivImgAttrib::date);
   load(raw_, record, &DBExivImgAttrib::raw);
   load(fullFilled_, record, &DBExivImgAttrib::full_filled);

@@ -80,6 +80,10 @@ void KRDBContext::waitForNecessaryEntities(const std::shared_ptr<KRDBEntity>& en
 
 void KRDBContext::cacheEntityAndFetchLinkedEntities(const std::shared_ptr<KRDBEntity>& entity) {
   if (!entity || !entity->entityID() || cachedEntityForEntityID(entity->entityID())) return;
+  cacheUncachedEntity(entity);
+}
+
+void KRDBContext::cacheUncachedEntity(const std::shared_ptr<KRDBEntity>& entity) {
   // Cached first, so that lookups made while its linked records are fetched find this object.
   fetchedEntities_->setEntity(entity, entity->entityID());
   if (entity->needFetchNecessaryEntities()) additionalFetchingForEntity(entity);
@@ -112,7 +116,7 @@ void KRDBContext::prepareFetchedEntity(const std::shared_ptr<KRDBEntity>& entity
 
 std::shared_ptr<KRDBEntity> KRDBContext::cachedOrCachingInstance(const std::shared_ptr<KRDBEntity>& entity) {
   if (auto cached = cachedEntityForEntityID(entity->entityID())) return cached;
-  cacheEntityAndFetchLinkedEntities(entity);
+  if (entity->entityID()) cacheUncachedEntity(entity);
   return entity;
 }
 

@@ -149,6 +149,8 @@ class KRDBContext : public KRAbstractModel, public KRDBEntityContext, public KRD
   std::weak_ptr<KRDBContext> weakSelf() { return selfPtr(); }
   // Turns the current run loop until the entity's linked records are attached.
   static void waitForNecessaryEntities(const std::shared_ptr<KRDBEntity>& entity);
+  // cacheEntityAndFetchLinkedEntities for an entity known not to be cached.
+  void cacheUncachedEntity(const std::shared_ptr<KRDBEntity>& entity);
   // The cached instance of an entity, caching (and starting the preparation of) the entity on a miss.
   std::shared_ptr<KRDBEntity> cachedOrCachingInstance(const std::shared_ptr<KRDBEntity>& entity);
   // Takes the linked records the catalog fetched for the entity: each is cached and the entity's count

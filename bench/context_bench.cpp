@@ -17,6 +17,7 @@
 #include <unordered_map>
 #include <vector>
 
+#include "KRBenchRecords.hpp"
 #include "KRBenchSqlite.hpp"
 #include "KRFoundation/KRDate.hpp"
 #include "KRFoundation/KRRunLoop.hpp"
@@ -56,14 +57,7 @@ void require(bool holds, const char* what) {
 
 // ---- The catalog
 
-// `count` new records, record i set up by `setUp(record, i)`.
-template <class Record, class SetUp>
-std::vector<std::shared_ptr<Record>> records(int count, SetUp&& setUp) {
-  std::vector<std::shared_ptr<Record>> made;
-  made.reserve(count);
-  for (int i = 0; i < count; ++i) setUp(*made.emplace_back(std::make_shared<Record>()), i);
-  return made;
-}
+using KRBenchRecords::records;
 
 // Two volumes, the folders alternating between them.
 std::vector<std::shared_ptr<dbcore::DBPath>> fillFolders(dbcore::DBReactor& reactor) {
@@ -217,19 +211,7 @@ struct RawState {
   bool original = false;
 };
 
-struct RawImage {
-  int64_t id = 0;
-  bool markedToDelete = false;
-  std::wstring guid;
-  std::wstring path;
-  int32_t width = 0;
-  int32_t height = 0;
-  int64_t fileSize = 0;
-  int64_t modificationDate = 0;
-  int64_t importDate = 0;
-  int32_t importIndex = 0;
-  int64_t creationDate = 0;
-  int64_t folderPathId = 0;
+struct RawImage : KRBenchRecords::RawImage {
   const RawPath* folder = nullptr;
   const RawUserAttributes* attributes = nullptr;
   const RawExivAttributes* exivAttributes = nullptr;

@@ -13,6 +13,7 @@
 #include <thread>
 #include <vector>
 
+#include "KRBenchRecords.hpp"
 #include "KRBenchSqlite.hpp"
 #include "KRFoundation/KRRunLoop.hpp"
 #include "Model/KRDBCatalog/KRDBCatalog.hpp"
@@ -46,14 +47,7 @@ const char* const kExifCondition = "camera_model_wide_ch == 'X-T0'";
 
 // ---- The catalog
 
-// `count` new records, record i set up by `setUp(record, i)`.
-template <class Record, class SetUp>
-std::vector<std::shared_ptr<Record>> records(int count, SetUp&& setUp) {
-  std::vector<std::shared_ptr<Record>> made;
-  made.reserve(count);
-  for (int i = 0; i < count; ++i) setUp(*made.emplace_back(std::make_shared<Record>()), i);
-  return made;
-}
+using KRBenchRecords::records;
 
 void fill(dbcore::DBReactor& reactor) {
   using namespace dbcore;
@@ -104,21 +98,7 @@ KRDBEntitySet fetch(KRDBCatalog& catalog, const KRDBCatalog::FetchRequestPtr& re
 
 // ---- Fetch
 
-// Every column of an image row.
-struct RawImage {
-  int64_t id = 0;
-  bool markedToDelete = false;
-  std::wstring guid;
-  std::wstring path;
-  int32_t width = 0;
-  int32_t height = 0;
-  int64_t fileSize = 0;
-  int64_t modificationDate = 0;
-  int64_t importDate = 0;
-  int32_t importIndex = 0;
-  int64_t creationDate = 0;
-  int64_t folderPathId = 0;
-};
+using KRBenchRecords::RawImage;
 
 const char* const kRawSelect =
     "SELECT i._id_int_64, i.marked_to_delete_bool, i.guid_wide_ch, i.path_wide_ch, i.width, i.height, "

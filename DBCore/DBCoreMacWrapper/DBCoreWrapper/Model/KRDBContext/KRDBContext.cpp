@@ -142,7 +142,10 @@ void KRDBContext::preparedEntities(const KRDBEntitySet& entities, EntitiesHandle
   progress->handler = std::move(handler);
   progress->result.reserve(entities.size());
   for (const auto& entity : entities) {
-    if (!entity) continue;
+    if (!entity) {
+      ++progress->finished;
+      continue;
+    }
     const auto instance = cachedOrCachingInstance(entity);
     progress->result.insert(instance);
     if (instance->necesserryEntitiesToFetchCount() != 0) {

@@ -178,6 +178,18 @@ TEST_F(KRDBContextTest, PreparedEntitiesOfNothingCallsTheHandlerAtOnceWithNothin
   EXPECT_TRUE(called);
 }
 
+TEST_F(KRDBContextTest, PreparedEntitiesSkipsAMissingEntity) {
+  const auto cached = imageWithID(images[0]);
+  KRDBEntitySet result;
+  bool called = false;
+  context->preparedEntities({nullptr, cached}, [&](KRDBEntitySet entities) {
+    result = std::move(entities);
+    called = true;
+  });
+  EXPECT_TRUE(called);
+  EXPECT_EQ(result, (KRDBEntitySet{cached}));
+}
+
 TEST_F(KRDBContextTest, PreparingReplacesALinkedCopyByTheCachedInstance) {
   const auto cached = imageWithID(images[0]);
   const auto copy =

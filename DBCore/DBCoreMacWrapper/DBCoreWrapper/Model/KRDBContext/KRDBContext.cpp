@@ -98,10 +98,10 @@ void KRDBContext::prepareFetchedEntity(const std::shared_ptr<KRDBEntity>& entity
   if (!entity) return;
   entity->addListener(selfPtr());
   entity->setContext(selfPtr());
-  // The keys of the linked-entities dictionary, read one by one rather than through a dictionary built
+  // The entries of the linked-entities dictionary, read one by one rather than through a dictionary built
   // per entity.
   for (const auto& key : entity->entityClass().necessaryLinkedEntitiesKeys()) {
-    const auto linked = entity->valueForKey(key).objectAs<KRDBEntity>();
+    const auto linked = entity->necessaryLinkedEntity(key);
     if (!linked) continue;
     auto instance = cachedEntityForEntityID(linked->entityID());
     if (!instance) {
@@ -127,7 +127,7 @@ std::shared_ptr<KRDBEntity> KRDBContext::preparedEntity(const std::shared_ptr<KR
   return instance;
 }
 
-void KRDBContext::preparedEntities(const KRDBEntitySet& entities, EntitiesHandler handler) {
+void KRDBContext::preparedEntities(KRDBEntitySet entities, EntitiesHandler handler) {
   struct Progress {
     KRDBEntitySet result;
     size_t finished = 0;
@@ -140,20 +140,23 @@ void KRDBContext::preparedEntities(const KRDBEntitySet& entities, EntitiesHandle
   const auto progress = std::make_shared<Progress>();
   progress->expected = entities.size();
   progress->handler = std::move(handler);
-  progress->result.reserve(entities.size());
+  // The set becomes the result: only the members that are not their own cached instance are replaced, so
+  // a freshly fetched million is not copied.
+  std::vector<std::pair<std::shared_ptr<KRDBEntity>, std::shared_ptr<KRDBEntity>>> replaced;
   for (const auto& entity : entities) {
-    if (!entity) {
-      ++progress->finished;
-      continue;
-    }
-    const auto instance = cachedOrCachingInstance(entity);
-    progress->result.insert(instance);
-    if (instance->necesserryEntitiesToFetchCount() != 0) {
+    const auto instance = entity ? cachedOrCachingInstance(entity) : nullptr;
+    if (instance != entity || !entity) replaced.emplace_back(entity, instance);
+    if (instance && instance->necesserryEntitiesToFetchCount() != 0) {
       instance->pushCompletionFetchingNecessaryEntities([progress] { progress->finishOne(); });
     } else {
       ++progress->finished;
     }
   }
+  for (const auto& [fetched, instance] : replaced) {
+    entities.erase(fetched);
+    if (instance) entities.insert(instance);
+  }
+  progress->result = std::move(entities);
   if (progress->handler && progress->finished == progress->expected)
     progress->handler(std::move(progress->result));
 }
@@ -201,7 +204,7 @@ void KRDBContext::obtainEntitiesUsingFetchRequest(const FetchRequestPtr& request
   catalog_->obtainFetchedEntitiesUsingFetchRequest(
       request,
       [weak, handler = std::move(handler)](KRDBEntitySet entities) {
-        if (const auto context = weak.lock()) context->preparedEntities(entities, handler);
+        if (const auto context = weak.lock()) context->preparedEntities(std::move(entities), handler);
       },
       false);
 }

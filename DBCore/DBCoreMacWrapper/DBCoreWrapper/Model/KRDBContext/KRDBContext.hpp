@@ -82,7 +82,7 @@ class KRDBContext : public KRAbstractModel, public KRDBEntityContext, public KRD
   // The cached instance for the entity's identifier (the entity itself when none), fully prepared.
   std::shared_ptr<KRDBEntity> preparedEntity(const std::shared_ptr<KRDBEntity>& entity);
   // The cached instances of the entities, handed over once all are prepared (at once for none).
-  void preparedEntities(const KRDBEntitySet& entities, EntitiesHandler handler);
+  void preparedEntities(KRDBEntitySet entities, EntitiesHandler handler);
   // The linked-record fetch driver: the fast path for images, then the catalog for what is still missing.
   void additionalFetchingForEntity(const std::shared_ptr<KRDBEntity>& entity);
   void makeFastAdditionalFetchesForEntity(const std::shared_ptr<KRDBEntity>& entity, Handler completion);

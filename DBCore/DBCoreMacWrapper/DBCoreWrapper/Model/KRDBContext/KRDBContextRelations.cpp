@@ -50,7 +50,7 @@ void KRDBContext::obtainChildsOfFilter(const std::shared_ptr<KRDBAbstractBaseFol
       [weak, filter, handler = std::move(handler)](KRDBEntitySet childs) {
         const auto context = weak.lock();
         if (!context) return;
-        context->preparedEntities(childs, [filter, handler](KRDBEntitySet instances) {
+        context->preparedEntities(std::move(childs), [filter, handler](KRDBEntitySet instances) {
           filter->setChildsPrimitive(std::make_shared<KRDBEntitySet>(instances));
           for (const auto& child : instances)
             std::static_pointer_cast<KRDBAbstractBaseFolder>(child)->setParentPrimitive(filter);
@@ -66,7 +66,7 @@ void KRDBContext::obtainDescendantsOfFilter(const std::shared_ptr<KRDBAbstractBa
   catalog_->fetchDescendantsOfFilter(
       filter,
       [weak, handler = std::move(handler)](KRDBEntitySet descendants) {
-        if (const auto context = weak.lock()) context->preparedEntities(descendants, handler);
+        if (const auto context = weak.lock()) context->preparedEntities(std::move(descendants), handler);
       },
       false);
 }
@@ -130,7 +130,7 @@ void KRDBContext::obtainCurrentStatesForImages(const KRDBEntityArray& images,
         KRDBEntitySet fetched;
         fetched.reserve(states.size());
         for (const auto& entry : states) fetched.insert(entry.second);
-        context->preparedEntities(fetched,
+        context->preparedEntities(std::move(fetched),
                                   [context, states = std::move(states), handler](KRDBEntitySet) mutable {
                                     for (auto& entry : states) {
                                       entry.second = std::static_pointer_cast<KRDBImageState>(

@@ -171,9 +171,13 @@ void KRDBEntity::reset() { favoriteAlias_ = nullptr; }
 
 bool KRDBEntity::needFetchNecessaryEntities() const {
   for (const auto& key : linkedEntitiesKeys()) {
-    if (valueForKey(key).isNil()) return true;
+    if (!necessaryLinkedEntity(key)) return true;
   }
   return false;
+}
+
+std::shared_ptr<KRDBEntity> KRDBEntity::necessaryLinkedEntity(const std::string& key) const {
+  return valueForKey(key).objectAs<KRDBEntity>();
 }
 
 KRDictionary KRDBEntity::necessaryLinkedEntitiesDictionary() const {

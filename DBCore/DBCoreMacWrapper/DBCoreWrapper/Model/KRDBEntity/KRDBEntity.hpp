@@ -88,6 +88,9 @@ class KRDBEntity : public KRAbstractModel {
   // ---- Necessary linked entities
   bool needFetchNecessaryEntities() const;
   KRDictionary necessaryLinkedEntitiesDictionary() const;
+  // The entity held under one of the necessary keys, or nil. Subclasses answer their own keys directly
+  // rather than through key-value coding: preparing a million images asks it several times each.
+  virtual std::shared_ptr<KRDBEntity> necessaryLinkedEntity(const std::string& key) const;
   // Sets the property by key when it is one of the necessary keys.
   virtual void updateNecessaryEntityForKey(const std::string& key, const std::shared_ptr<KRDBEntity>& entity);
   void pushCompletionFetchingNecessaryEntities(Completion completion);

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <climits>
 #include <cmath>
+#include <type_traits>
 #include <unordered_map>
 
 #include "KRClasses/KRTCropDescription.hpp"
@@ -318,11 +319,43 @@ void KRDBImage::setFolderDBPathPrimitive(const std::shared_ptr<KRDBPath>& path, 
   didChangeWithoutRecord();
 }
 
+std::shared_ptr<KRDBEntity> KRDBImage::necessaryLinkedEntity(const std::string& key) const {
+  if (key == kAttributesPrimitive) return attributes_;
+  if (key == kExivAttributesPrimitive) return exivAttributes_;
+  if (key == kFolderDBPathPrimitive) return folderDBPath_;
+  return KRDBEntity::necessaryLinkedEntity(key);
+}
+
 void KRDBImage::updateNecessaryEntityForKey(const std::string& key,
                                             const std::shared_ptr<KRDBEntity>& entity) {
+  if (linkedDirectly(key, entity)) return;
   KRDBEntity::updateNecessaryEntityForKey(key, entity);
   const std::string reverseKey = reverseKeyForNecessaryKey(key);
   if (!reverseKey.empty() && entity) entity->setValueForKey(KRValue(self()), reverseKey);
+}
+
+bool KRDBImage::linkedDirectly(const std::string& key, const std::shared_ptr<KRDBEntity>& entity) {
+  if (key == kAttributesPrimitive)
+    return linkAttributes(std::dynamic_pointer_cast<KRDBImageAttributes>(entity));
+  if (key == kExivAttributesPrimitive)
+    return linkAttributes(std::dynamic_pointer_cast<KRDBImageExivAttributes>(entity));
+  if (key != kFolderDBPathPrimitive) return false;
+  const auto path = std::dynamic_pointer_cast<KRDBPath>(entity);
+  if (!path) return false;
+  setFolderDBPathPrimitive(path);
+  return true;
+}
+
+template <class Attributes>
+bool KRDBImage::linkAttributes(const std::shared_ptr<Attributes>& attributes) {
+  if (!attributes) return false;
+  if constexpr (std::is_same_v<Attributes, KRDBImageAttributes>) {
+    setAttributesPrimitive(attributes);
+  } else {
+    setExivAttributesPrimitive(attributes);
+  }
+  attributes->setImagePrimitive(selfImage());
+  return true;
 }
 
 void KRDBImage::pathDidChange(const std::shared_ptr<KRDBPath>& path) {

@@ -114,6 +114,7 @@ class KRDBImage : public KRDBConcreteEntity<KRDBImage, KRDBEntity, KRDBEntityTyp
   }
   // Moves the image's listener registration to the new path; with `notify`, posts the change.
   void setFolderDBPathPrimitive(const std::shared_ptr<KRDBPath>& path, bool notify);
+  std::shared_ptr<KRDBEntity> necessaryLinkedEntity(const std::string& key) const override;
   void updateNecessaryEntityForKey(const std::string& key,
                                    const std::shared_ptr<KRDBEntity>& entity) override;
 
@@ -153,6 +154,11 @@ class KRDBImage : public KRDBConcreteEntity<KRDBImage, KRDBEntity, KRDBEntityTyp
   bool storeInfoFromDBImage(const std::shared_ptr<dbcore::DBImage>& image);
 
  private:
+  // The typed form of updateNecessaryEntityForKey for the image's own link keys: false, changing
+  // nothing, for another key or an entity of another class (left to key-value coding).
+  bool linkedDirectly(const std::string& key, const std::shared_ptr<KRDBEntity>& entity);
+  template <class Attributes>
+  bool linkAttributes(const std::shared_ptr<Attributes>& attributes);
   std::shared_ptr<KRDBImage> selfImage() { return std::static_pointer_cast<KRDBImage>(self()); }
   void dropSizeCaches();
   KRSize computedCroppedSize() const;

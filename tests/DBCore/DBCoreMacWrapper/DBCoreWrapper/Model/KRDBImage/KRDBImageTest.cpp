@@ -506,6 +506,25 @@ TEST(KRDBImageTest, TheNecessaryLinksAndTheirReverseKeys) {
   EXPECT_EQ(image->folderDBPath(), path);
 }
 
+// The links are read and set without key-value coding, with the same outcome: a link of another class
+// or none goes through key-value coding, which empties the slot (and refuses the back link a path lacks).
+TEST(KRDBImageTest, TheNecessaryLinksAreReadAndSetDirectly) {
+  const auto image = makeImage();
+  const auto attributes = makeAttributes();
+  const auto path = makePath();
+  EXPECT_FALSE(image->necessaryLinkedEntity("attributesPrimitive"));
+  image->updateNecessaryEntityForKey("attributesPrimitive", attributes);
+  image->updateNecessaryEntityForKey("folderDBPathPrimitive", path);
+  EXPECT_EQ(image->necessaryLinkedEntity("attributesPrimitive"), attributes);
+  EXPECT_EQ(image->necessaryLinkedEntity("folderDBPathPrimitive"), path);
+  EXPECT_FALSE(image->necessaryLinkedEntity("exivAttributesPrimitive"));
+  EXPECT_TRUE(image->needFetchNecessaryEntities());
+  EXPECT_THROW(image->updateNecessaryEntityForKey("attributesPrimitive", path), KRException);
+  EXPECT_FALSE(image->attributesPrimitive());
+  image->updateNecessaryEntityForKey("folderDBPathPrimitive", nullptr);
+  EXPECT_FALSE(image->folderDBPath());
+}
+
 TEST_F(KRDBImageBehaviourTest, TheDeletionKeyIsTheTypeAndThePath) {
   image->setFolderDBPathPrimitive(makePath(L"/photos"));
   EXPECT_EQ(image->markedToDeleteHashKey(), KRString("1-/photos/IMG_0001.CR3"));
@@ -545,7 +564,7 @@ TEST_F(KRDBImageBehaviourTest, AnUnknownKeyIsLoggedAndIgnored) {
   const std::vector<KRLogRecord> records = sink.records();
   ASSERT_EQ(records.size(), 1u);
   EXPECT_EQ(records[0], (KRLogRecord{4, "DBCore/DBCoreMacWrapper/DBCoreWrapper/Model/KRDBImage/KRDBImage",
-                                     "setValueForUndefinedKey", 279,
+                                     "setValueForUndefinedKey", 280,
                                      "Warning!!!\nUndefined Key: noSuchKey\nFor obj Class: KRDBImage"}));
 }
 

@@ -4,6 +4,7 @@
 
 #include <memory>
 
+#include "Model/KRDBEntity/KRDBEntityClasses.hpp"
 #include "Model/KRDBEntity/KRDBEntityType.hpp"
 #include "Model/KRDBImage/KRDBImage.hpp"
 #include "Model/KRDBPath/KRDBPath.hpp"
@@ -13,12 +14,14 @@
 namespace {
 
 std::shared_ptr<KRDBImage> makeImage(int64_t id) {
+  KRDBEntityClasses::registerAll();
   auto record = std::make_shared<dbcore::DBImage>();
   record->set_id(id);
   return KRDBImage::initWithDBEntity(record);
 }
 
 std::shared_ptr<KRDBPath> makePath(int64_t id) {
+  KRDBEntityClasses::registerAll();
   auto record = std::make_shared<dbcore::DBPath>();
   record->set_id(id);
   return KRDBPath::initWithDBEntity(record);

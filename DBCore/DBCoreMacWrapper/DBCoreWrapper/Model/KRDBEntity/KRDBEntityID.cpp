@@ -18,7 +18,7 @@ KRDBEntityID::KRDBEntityID(int64_t entityType, int64_t databaseID)
     : hash_(hashOf(entityType, databaseID)), entityType_(entityType), dbid_(databaseID) {}
 
 std::shared_ptr<KRDBEntityID> KRDBEntityID::initWithEntityType(int64_t entityType, int64_t databaseID) {
-  return std::shared_ptr<KRDBEntityID>(new KRDBEntityID(entityType, databaseID));
+  return std::allocate_shared<KRDBEntityID>(Allocator<KRDBEntityID>(), entityType, databaseID);
 }
 
 bool KRDBEntityID::isEqual(const std::shared_ptr<const KRObject>& other) const {
@@ -30,7 +30,7 @@ bool KRDBEntityID::isEqualTo(const std::shared_ptr<const KRDBEntityID>& other) c
 }
 
 std::shared_ptr<KRDBEntityID> KRDBEntityID::copyWithZone() const {
-  return std::shared_ptr<KRDBEntityID>(new KRDBEntityID(entityType_, dbid_));
+  return initWithEntityType(entityType_, dbid_);
 }
 
 std::string KRDBEntityID::description() const {

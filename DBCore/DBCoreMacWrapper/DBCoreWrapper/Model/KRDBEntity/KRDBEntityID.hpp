@@ -3,6 +3,7 @@
 #include <cstdint>
 #include <memory>
 #include <string>
+#include <utility>
 
 #include "KRFoundation/KRObject.hpp"
 
@@ -31,6 +32,23 @@ class KRDBEntityID : public KRObject {
   KRDBEntityID(int64_t entityType, int64_t databaseID);
 
  private:
+  // Builds identifiers in place next to their reference count, in one allocation (a catalog holds
+  // several per image); as a member it reaches the protected constructor.
+  template <class T>
+  struct Allocator : std::allocator<T> {
+    template <class U>
+    struct rebind {
+      using other = Allocator<U>;
+    };
+    Allocator() = default;
+    template <class U>
+    Allocator(const Allocator<U>& /*other*/) {}
+    template <class U, class... Args>
+    void construct(U* place, Args&&... args) {
+      ::new (static_cast<void*>(place)) U(std::forward<Args>(args)...);
+    }
+  };
+
   uint64_t hash_;
   int64_t entityType_;
   int64_t dbid_;

@@ -2,8 +2,10 @@
 
 #include <cstdint>
 #include <memory>
+#include <utility>
 
 #include "Model/KRDBEntity/KRDBEntity.hpp"
+#include "Support/KRDBInPlaceAllocator.hpp"
 
 // The class side that every concrete entity class shares: its two type numbers, construction over an
 // engine record, its registry entry. Derived names the class itself, Base its direct base.
@@ -16,7 +18,7 @@ class KRDBConcreteEntity : public Base {
   // Nil without a record. A record of another class still gives an entity, whose store hook refused it.
   static std::shared_ptr<Derived> initWithDBEntity(const KRDBEntity::Record& record) {
     if (!record) return nullptr;
-    std::shared_ptr<Derived> entity(new Derived(record));
+    auto entity = std::allocate_shared<Derived>(KRDBInPlaceAllocator<Derived, Builder>(), record);
     entity->storeInfoFromDBentity(record);
     return entity;
   }
@@ -33,6 +35,15 @@ class KRDBConcreteEntity : public Base {
   explicit KRDBConcreteEntity(KRDBEntity::Record record) : Base(std::move(record)) {}
 
  private:
+  // Builds entities in place for KRDBInPlaceAllocator (a catalog holds several per image); as a member of
+  // the class each entity befriends, it reaches their constructors.
+  struct Builder {
+    template <class U, class... Args>
+    static void build(U* place, Args&&... args) {
+      ::new (static_cast<void*>(place)) U(std::forward<Args>(args)...);
+    }
+  };
+
   static std::shared_ptr<KRDBEntity> makeEntity(const KRDBEntity::Record& record) {
     return initWithDBEntity(record);
   }

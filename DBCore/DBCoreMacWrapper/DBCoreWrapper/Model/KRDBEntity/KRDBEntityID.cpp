@@ -18,7 +18,8 @@ KRDBEntityID::KRDBEntityID(int64_t entityType, int64_t databaseID)
     : hash_(hashOf(entityType, databaseID)), entityType_(entityType), dbid_(databaseID) {}
 
 std::shared_ptr<KRDBEntityID> KRDBEntityID::initWithEntityType(int64_t entityType, int64_t databaseID) {
-  return std::allocate_shared<KRDBEntityID>(Allocator<KRDBEntityID>(), entityType, databaseID);
+  return std::allocate_shared<KRDBEntityID>(KRDBInPlaceAllocator<KRDBEntityID, Builder>(), entityType,
+                                            databaseID);
 }
 
 bool KRDBEntityID::isEqual(const std::shared_ptr<const KRObject>& other) const {

@@ -6,6 +6,7 @@
 #include <utility>
 
 #include "KRFoundation/KRObject.hpp"
+#include "Support/KRDBInPlaceAllocator.hpp"
 
 // The identity of one catalog object: its entity type and the id of its engine record. Immutable; the
 // hash is computed once. Any thread may use an identifier.
@@ -32,19 +33,11 @@ class KRDBEntityID : public KRObject {
   KRDBEntityID(int64_t entityType, int64_t databaseID);
 
  private:
-  // Builds identifiers in place next to their reference count, in one allocation (a catalog holds
-  // several per image); as a member it reaches the protected constructor.
-  template <class T>
-  struct Allocator : std::allocator<T> {
-    template <class U>
-    struct rebind {
-      using other = Allocator<U>;
-    };
-    Allocator() = default;
-    template <class U>
-    Allocator(const Allocator<U>& /*other*/) {}
+  // Builds identifiers in place for KRDBInPlaceAllocator (a catalog holds several per image); as a member
+  // it reaches the protected constructor.
+  struct Builder {
     template <class U, class... Args>
-    void construct(U* place, Args&&... args) {
+    static void build(U* place, Args&&... args) {
       ::new (static_cast<void*>(place)) U(std::forward<Args>(args)...);
     }
   };

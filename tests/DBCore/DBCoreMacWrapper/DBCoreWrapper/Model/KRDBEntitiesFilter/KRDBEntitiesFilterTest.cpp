@@ -8,13 +8,11 @@
 
 #include "KRFoundation/KRException.hpp"
 #include "KRServices/KRCapturingLogSink.hpp"
+#include "KRTestEntities.hpp"
 #include "Model/KRDBEntitiesFilter/KRDBValueBox.hpp"
-#include "Model/KRDBEntity/KRDBEntityClasses.hpp"
 #include "Model/KRDBEntity/KRDBEntityType.hpp"
 #include "Model/KRDBImage/KRDBImage.hpp"
 #include "Model/KRDBPath/KRDBPath.hpp"
-#include "dbimage.hpp"
-#include "dbpath.hpp"
 
 namespace {
 
@@ -25,19 +23,8 @@ using EntityArrayPtr = KRDBEntitiesFilter::EntityArrayPtr;
 const char* const kSource =
     "DBCore/DBCoreMacWrapper/DBCoreWrapper/Model/KRDBEntitiesFilter/KRDBEntitiesFilter";
 
-EntityPtr makeImage(int64_t id) {
-  KRDBEntityClasses::registerAll();
-  auto record = std::make_shared<dbcore::DBImage>();
-  record->set_id(id);
-  return KRDBImage::initWithDBEntity(record);
-}
-
-EntityPtr makePath(int64_t id) {
-  KRDBEntityClasses::registerAll();
-  auto record = std::make_shared<dbcore::DBPath>();
-  record->set_id(id);
-  return KRDBPath::initWithDBEntity(record);
-}
+using KRTestEntities::makeImage;
+using KRTestEntities::makePath;
 
 EntitySetPtr setOf(std::initializer_list<EntityPtr> entities) {
   return std::make_shared<KRDBEntitySet>(entities);

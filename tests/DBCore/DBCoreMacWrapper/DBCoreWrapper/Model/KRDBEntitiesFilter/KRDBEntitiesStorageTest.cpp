@@ -4,28 +4,15 @@
 
 #include <memory>
 
-#include "Model/KRDBEntity/KRDBEntityClasses.hpp"
+#include "KRTestEntities.hpp"
 #include "Model/KRDBEntity/KRDBEntityType.hpp"
 #include "Model/KRDBImage/KRDBImage.hpp"
 #include "Model/KRDBPath/KRDBPath.hpp"
-#include "dbimage.hpp"
-#include "dbpath.hpp"
 
 namespace {
 
-std::shared_ptr<KRDBImage> makeImage(int64_t id) {
-  KRDBEntityClasses::registerAll();
-  auto record = std::make_shared<dbcore::DBImage>();
-  record->set_id(id);
-  return KRDBImage::initWithDBEntity(record);
-}
-
-std::shared_ptr<KRDBPath> makePath(int64_t id) {
-  KRDBEntityClasses::registerAll();
-  auto record = std::make_shared<dbcore::DBPath>();
-  record->set_id(id);
-  return KRDBPath::initWithDBEntity(record);
-}
+using KRTestEntities::makeImage;
+using KRTestEntities::makePath;
 
 TEST(KRDBEntitiesStorageTest, HasOneMapPerEntityType) {
   const auto storage = KRDBEntitiesStorage::init();

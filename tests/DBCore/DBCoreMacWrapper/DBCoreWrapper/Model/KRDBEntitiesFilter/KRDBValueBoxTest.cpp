@@ -4,19 +4,13 @@
 
 #include <memory>
 
-#include "Model/KRDBEntity/KRDBEntityClasses.hpp"
+#include "KRTestEntities.hpp"
 #include "Model/KRDBEntity/KRDBEntityContext.hpp"
 #include "Model/KRDBImage/KRDBImage.hpp"
-#include "dbimage.hpp"
 
 namespace {
 
-std::shared_ptr<KRDBImage> makeImage(int64_t id) {
-  KRDBEntityClasses::registerAll();
-  auto record = std::make_shared<dbcore::DBImage>();
-  record->set_id(id);
-  return KRDBImage::initWithDBEntity(record);
-}
+using KRTestEntities::makeImage;
 
 TEST(KRDBValueBoxTest, TheValueCarriesTheSameObjectWithoutCopyingIt) {
   const auto entities = std::make_shared<KRDBEntitySet>(KRDBEntitySet{makeImage(1), makeImage(2)});

@@ -1,6 +1,8 @@
 #include "KRClasses/KRAbstractModel.hpp"
 
 #include <algorithm>
+#include <array>
+#include <cstdint>
 
 #include "KRFoundation/KRBlockWaiter.hpp"
 #include "KRFoundation/KRRunLoop.hpp"
@@ -14,73 +16,107 @@ bool refersTo(const std::weak_ptr<KRObject>& entry, const KRObject* object) {
 
 }  // namespace
 
+std::mutex& KRAbstractModel::lock() const {
+  static std::array<std::mutex, 64> locks;
+  return locks[(reinterpret_cast<uintptr_t>(this) >> 4) % locks.size()];
+}
+
 size_t KRAbstractModel::positionOf(const KRObject* listener) const {
-  if (index_) {
-    const auto found = index_->positions.find(listener);
-    if (found == index_->positions.end() || !refersTo(listeners_[found->second], listener)) return kNotListed;
+  if (moreListeners_) return listedPositionOf(listener);
+  return refersTo(onlyListener_, listener) ? 0 : kNotListed;
+}
+
+size_t KRAbstractModel::listedPositionOf(const KRObject* listener) const {
+  const auto& entries = moreListeners_->entries;
+  if (const auto& index = moreListeners_->index) {
+    const auto found = index->positions.find(listener);
+    if (found == index->positions.end() || !refersTo(entries[found->second], listener)) return kNotListed;
     return found->second;
   }
-  for (size_t position = 0; position < listeners_.size(); ++position) {
-    if (refersTo(listeners_[position], listener)) return position;
+  for (size_t position = 0; position < entries.size(); ++position) {
+    if (refersTo(entries[position], listener)) return position;
   }
   return kNotListed;
 }
 
 void KRAbstractModel::rebuildPositions() {
-  if (listeners_.size() <= kIndexedListeners) {
-    index_.reset();
+  const auto& entries = moreListeners_->entries;
+  auto& index = moreListeners_->index;
+  if (entries.size() <= kIndexedListeners) {
+    index.reset();
     return;
   }
-  if (!index_) index_ = std::make_unique<Index>();
-  index_->positions.clear();
-  index_->positions.reserve(listeners_.size());
-  for (size_t position = 0; position < listeners_.size(); ++position) {
-    if (const auto held = listeners_[position].lock()) index_->positions[held.get()] = position;
+  if (!index) index = std::make_unique<Index>();
+  index->positions.clear();
+  index->positions.reserve(entries.size());
+  for (size_t position = 0; position < entries.size(); ++position) {
+    if (const auto held = entries[position].lock()) index->positions[held.get()] = position;
   }
 }
 
 void KRAbstractModel::eraseAt(size_t position) {
-  listeners_.erase(listeners_.begin() + static_cast<std::ptrdiff_t>(position));
+  if (!moreListeners_) return onlyListener_.reset();
+  auto& entries = moreListeners_->entries;
+  entries.erase(entries.begin() + static_cast<std::ptrdiff_t>(position));
   rebuildPositions();
 }
 
 void KRAbstractModel::dropGoneListeners() {
-  if (index_ && listeners_.size() < index_->pruneAt) return;
-  std::erase_if(listeners_, [](const auto& entry) { return entry.expired(); });
+  auto& index = moreListeners_->index;
+  if (index && moreListeners_->entries.size() < index->pruneAt) return;
+  std::erase_if(moreListeners_->entries, [](const auto& entry) { return entry.expired(); });
   rebuildPositions();
-  if (index_) index_->pruneAt = 2 * listeners_.size();
+  if (index) index->pruneAt = 2 * moreListeners_->entries.size();
+}
+
+void KRAbstractModel::append(const std::shared_ptr<KRObject>& listener) {
+  if (!moreListeners_) {
+    if (onlyListener_.expired()) {
+      onlyListener_ = listener;
+      return;
+    }
+    moreListeners_ = std::make_unique<Listeners>();
+    moreListeners_->entries.push_back(std::move(onlyListener_));
+    onlyListener_.reset();
+  }
+  auto& index = moreListeners_->index;
+  // An entry left by a dead observer at the same address is replaced.
+  if (index) {
+    const auto stale = index->positions.find(listener.get());
+    if (stale != index->positions.end()) eraseAt(stale->second);
+  }
+  auto& entries = moreListeners_->entries;
+  entries.push_back(listener);
+  if (index) index->positions[listener.get()] = entries.size() - 1;
+  dropGoneListeners();
 }
 
 void KRAbstractModel::addListener(const std::shared_ptr<KRObject>& listener) {
   if (!listener) return;
-  std::lock_guard lock(mutex_);
-  if (positionOf(listener.get()) != kNotListed) return;
-  // An entry left by a dead observer at the same address is replaced.
-  if (index_) {
-    const auto stale = index_->positions.find(listener.get());
-    if (stale != index_->positions.end()) eraseAt(stale->second);
-  }
-  listeners_.push_back(listener);
-  if (index_) index_->positions[listener.get()] = listeners_.size() - 1;
-  dropGoneListeners();
+  std::lock_guard held(lock());
+  if (positionOf(listener.get()) == kNotListed) append(listener);
 }
 
 void KRAbstractModel::removeListener(const std::shared_ptr<KRObject>& listener) {
-  std::lock_guard lock(mutex_);
+  std::lock_guard held(lock());
   const size_t position = positionOf(listener.get());
   if (position != kNotListed) eraseAt(position);
 }
 
 bool KRAbstractModel::hasListener(const std::shared_ptr<KRObject>& listener) const {
-  std::lock_guard lock(mutex_);
+  std::lock_guard held(lock());
   return positionOf(listener.get()) != kNotListed;
 }
 
 std::vector<std::shared_ptr<KRObject>> KRAbstractModel::listeners() const {
-  std::lock_guard lock(mutex_);
+  std::lock_guard held(lock());
   std::vector<std::shared_ptr<KRObject>> live;
-  live.reserve(listeners_.size());
-  for (const auto& entry : listeners_) {
+  if (!moreListeners_) {
+    if (auto only = onlyListener_.lock()) live.push_back(std::move(only));
+    return live;
+  }
+  live.reserve(moreListeners_->entries.size());
+  for (const auto& entry : moreListeners_->entries) {
     if (auto held = entry.lock()) live.push_back(std::move(held));
   }
   return live;

@@ -54,19 +54,31 @@ class KRAbstractModel : public KRObject {
     std::unordered_map<const KRObject*, size_t> positions;
     size_t pruneAt = 0;
   };
+  // The observers once there have been two at a time; lists longer than kIndexedListeners get an index.
+  struct Listeners {
+    std::vector<std::weak_ptr<KRObject>> entries;
+    std::unique_ptr<Index> index;
+  };
   static constexpr size_t kNotListed = static_cast<size_t>(-1);
   // Lists longer than this get a position index; shorter ones are searched.
   static constexpr size_t kIndexedListeners = 8;
 
+  // One lock of a fixed set, chosen by address: a model with a mutex of its own would double the size of
+  // the small ones (a catalog keeps millions). No code holds two of them at once.
+  std::mutex& lock() const;
   // The position of the live entry for the object, or kNotListed. Called under the lock.
   size_t positionOf(const KRObject* listener) const;
+  size_t listedPositionOf(const KRObject* listener) const;
+  // Adds an observer known not to be listed, moving to the list form at the second one.
+  void append(const std::shared_ptr<KRObject>& listener);
   void eraseAt(size_t position);
   // Drops the entries of observers that are gone: at every addition while the list is short, otherwise
   // once it has doubled since the last time, so that dead entries cost amortised constant time.
   void dropGoneListeners();
   void rebuildPositions();
 
-  mutable std::mutex mutex_;
-  std::vector<std::weak_ptr<KRObject>> listeners_;
-  std::unique_ptr<Index> index_;
+  // onlyListener holds the observer while there has never been more than one (most models have one, or
+  // none); moreListeners replaces it from the second on.
+  std::weak_ptr<KRObject> onlyListener_;
+  std::unique_ptr<Listeners> moreListeners_;
 };

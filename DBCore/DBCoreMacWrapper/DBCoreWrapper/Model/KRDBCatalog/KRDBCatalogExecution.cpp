@@ -38,7 +38,9 @@ KRDBEntitySet fetchWithRequest(KRDBCatalog& catalog, const KRDBCatalog::FetchReq
   const auto query = request ? std::dynamic_pointer_cast<Query>(request->selectQuery()) : nullptr;
   const auto reactor = catalog.dbReactor();
   if (!query || !reactor) return entities;
-  for (const auto& record : reactor->GetBySelectQuery<Record>(query)) {
+  const auto records = reactor->GetBySelectQuery<Record>(query);
+  entities.reserve(records.size());
+  for (const auto& record : records) {
     if (auto entity = KRDBEntity::entityWithDBEntity(record)) entities.insert(std::move(entity));
   }
   return entities;

@@ -15,23 +15,23 @@
 
 namespace {
 
-// The entry of the map under the key, or nil.
-template <class Map>
-typename Map::mapped_type entryOf(const Map& map, int64_t key) {
-  const auto found = map.find(key);
-  return found == map.end() ? typename Map::mapped_type{} : found->second;
+// The entity of the map under the key, or nil.
+template <class Entity>
+std::shared_ptr<Entity> entryOf(const KRDBIDIndexedMap<std::shared_ptr<Entity>>& map, int64_t key) {
+  const auto* found = map.find(key);
+  return found ? *found : nullptr;
 }
 
 // Attribute entities by the image id of their records.
-template <class Entity, class Map>
-Map byImageID(const KRDBEntitySet& entities, auto record) {
-  Map map;
-  map.reserve(entities.size());
+template <class Entity>
+KRDBIDIndexedMap<std::shared_ptr<Entity>> byImageID(const KRDBEntitySet& entities, auto record) {
+  std::vector<std::pair<int64_t, std::shared_ptr<Entity>>> entries;
+  entries.reserve(entities.size());
   for (const auto& entity : entities) {
-    const auto typed = std::static_pointer_cast<Entity>(entity);
-    if (const auto held = ((*typed).*record)()) map.emplace(held->image_id, typed);
+    auto typed = std::static_pointer_cast<Entity>(entity);
+    if (const auto held = ((*typed).*record)()) entries.emplace_back(held->image_id, std::move(typed));
   }
-  return map;
+  return KRDBIDIndexedMap<std::shared_ptr<Entity>>(std::move(entries));
 }
 
 }  // namespace
@@ -76,11 +76,10 @@ void KRDBAdditionalFetchForImagesService::fastAdditionalFetchesForImage(
 
 void KRDBAdditionalFetchForImagesService::attachPath(const std::shared_ptr<KRDBImage>& image,
                                                      int64_t imageID) {
-  const auto found = imagesPathesMap_->find(imageID);
+  const int64_t* pathID = imagesPathesMap_->find(imageID);
   const auto context = context_.lock();
-  if (found == imagesPathesMap_->end() || !context) return;
-  const auto path =
-      context->entityWithID(KRDBEntityID::initWithEntityType(KRDBEntityTypePath, found->second));
+  if (!pathID || !context) return;
+  const auto path = context->entityWithID(KRDBEntityID::initWithEntityType(KRDBEntityTypePath, *pathID));
   image->setFolderDBPathPrimitive(std::static_pointer_cast<KRDBPath>(path));
 }
 
@@ -139,25 +138,24 @@ void KRDBAdditionalFetchForImagesService::fetchCurrentStatesMap(const std::share
 }
 
 void KRDBAdditionalFetchForImagesService::storePathes(KRDictionary connections) {
-  PathIDs pathIDs;
+  std::vector<PathIDs::Entry> pathIDs;
   pathIDs.reserve(connections.count());
   for (const auto& [image, path] : connections.entries())
-    pathIDs.emplace(image.number().longLongValue(), path.number().longLongValue());
-  imagesPathesMap_ = std::move(pathIDs);
+    pathIDs.emplace_back(image.number().longLongValue(), path.number().longLongValue());
+  imagesPathesMap_.emplace(std::move(pathIDs));
 }
 
 void KRDBAdditionalFetchForImagesService::storeAttributes(KRDBEntitySet entities) {
-  imagesImageAttributesMap_ =
-      byImageID<KRDBImageAttributes, AttributesByImage>(entities, &KRDBImageAttributes::dbattrib);
+  imagesImageAttributesMap_ = byImageID<KRDBImageAttributes>(entities, &KRDBImageAttributes::dbattrib);
 }
 
 void KRDBAdditionalFetchForImagesService::storeExivAttributes(KRDBEntitySet entities) {
-  imagesImageExivAttributesMap_ = byImageID<KRDBImageExivAttributes, ExivAttributesByImage>(
-      entities, &KRDBImageExivAttributes::dbexivattrib);
+  imagesImageExivAttributesMap_ =
+      byImageID<KRDBImageExivAttributes>(entities, &KRDBImageExivAttributes::dbexivattrib);
 }
 
 void KRDBAdditionalFetchForImagesService::storeCurrentStates(KRDBCatalog::ImageStatesByID states) {
-  imagesCurrentStatesMap_ = StatesByImage(states.begin(), states.end());
+  imagesCurrentStatesMap_.emplace(std::vector<StatesByImage::Entry>(states.begin(), states.end()));
 }
 
 bool KRDBAdditionalFetchForImagesService::allFetchesCompleted() const {

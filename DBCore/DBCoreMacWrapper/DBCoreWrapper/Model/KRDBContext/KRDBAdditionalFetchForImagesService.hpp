@@ -4,11 +4,11 @@
 #include <functional>
 #include <memory>
 #include <optional>
-#include <unordered_map>
 #include <vector>
 
 #include "KRFoundation/KRObject.hpp"
 #include "Model/KRDBCatalog/KRDBCatalog.hpp"
+#include "Support/KRDBIDIndexedMap.hpp"
 
 class KRDBContext;
 class KRDBImage;
@@ -24,10 +24,10 @@ class KRDBImageState;
 class KRDBAdditionalFetchForImagesService : public KRObject {
  public:
   using Handler = std::function<void()>;
-  using PathIDs = std::unordered_map<int64_t, int64_t>;
-  using AttributesByImage = std::unordered_map<int64_t, std::shared_ptr<KRDBImageAttributes>>;
-  using ExivAttributesByImage = std::unordered_map<int64_t, std::shared_ptr<KRDBImageExivAttributes>>;
-  using StatesByImage = std::unordered_map<int64_t, std::shared_ptr<KRDBImageState>>;
+  using PathIDs = KRDBIDIndexedMap<int64_t>;
+  using AttributesByImage = KRDBIDIndexedMap<std::shared_ptr<KRDBImageAttributes>>;
+  using ExivAttributesByImage = KRDBIDIndexedMap<std::shared_ptr<KRDBImageExivAttributes>>;
+  using StatesByImage = KRDBIDIndexedMap<std::shared_ptr<KRDBImageState>>;
 
   static std::shared_ptr<KRDBAdditionalFetchForImagesService> initWithContext(
       const std::shared_ptr<KRDBContext>& context);

@@ -28,22 +28,36 @@ const char* const kURLKey = "url";
 // An alias gives its entity back through originalEntityPrimitive. When the alias already names another
 // entity, the catalog's relation was inconsistent: that is reported, and the last entity to ask wins.
 void KRDBEntity::createFavoriteAliasIfNeeded() {
-  if (favoriteAlias_) return;
+  if (favoriteAliasPrimitive()) return;
   const auto owner = context();
   if (!owner) return;
-  favoriteAlias_ = owner->favoriteAliasForEntity(self());
-  if (!favoriteAlias_) return;
-  const auto original = favoriteAlias_->originalEntityPrimitive();
+  const auto alias = rare().favoriteAlias = owner->favoriteAliasForEntity(self());
+  if (!alias) return;
+  const auto original = alias->originalEntityPrimitive();
   if (original && original.get() != this) {
     KRLog(KRLogLevelError, "Error: Inconsistence in favoriteAlias - entity relation");
   }
-  favoriteAlias_->setOriginalEntityPrimitive(self());
+  alias->setOriginalEntityPrimitive(self());
+}
+
+const std::shared_ptr<KRDBEntityFavoriteAlias>& KRDBEntity::favoriteAliasPrimitive() const {
+  static const std::shared_ptr<KRDBEntityFavoriteAlias> none;
+  return rare_ ? rare_->favoriteAlias : none;
+}
+
+void KRDBEntity::setFavoriteAliasPrimitive(std::shared_ptr<KRDBEntityFavoriteAlias> alias) {
+  if (alias || rare_) rare().favoriteAlias = std::move(alias);
+}
+
+KRDBEntity::Rare& KRDBEntity::rare() {
+  if (!rare_) rare_ = std::make_unique<Rare>();
+  return *rare_;
 }
 
 KRDBEntity::KRDBEntity(Record record)
-    : markedToDelete_(record->marked_to_delete()),
-      entityID_(KRDBEntityID::initWithEntityType(entityTypeForDBEntityType(record->type()), record->id())),
-      dbentity_(std::move(record)) {}
+    : entityID_(KRDBEntityID::initWithEntityType(entityTypeForDBEntityType(record->type()), record->id())),
+      dbentity_(std::move(record)),
+      markedToDelete_(dbentity_->marked_to_delete()) {}
 
 // ---- Registry
 
@@ -145,9 +159,9 @@ void KRDBEntity::notifyEntityDidChange(const KRDictionary& info) {
 }
 
 void KRDBEntity::setValidationRecord(const Record& record) {
-  if (record == validationRecord_) return;
-  validationRecord_ = record;
-  if (validationRecord_) notifyObserversWithSelector(&KRDBEntityObserver::validationRecordDidSet, self());
+  if (record == validationRecord()) return;
+  if (record || rare_) rare().validationRecord = record;
+  if (record) notifyObserversWithSelector(&KRDBEntityObserver::validationRecordDidSet, self());
 }
 
 void KRDBEntity::resetValidationRecord() { setValidationRecord(nullptr); }
@@ -162,10 +176,10 @@ void KRDBEntity::setMarkedToDelete(bool markedToDelete) {
 
 void KRDBEntity::resetToDefaultState() {
   setMarkedToDelete(false);
-  if (favoriteAlias_) favoriteAlias_->resetToDefaultState();
+  if (const auto& alias = favoriteAliasPrimitive()) alias->resetToDefaultState();
 }
 
-void KRDBEntity::reset() { favoriteAlias_ = nullptr; }
+void KRDBEntity::reset() { setFavoriteAliasPrimitive(nullptr); }
 
 // ---- Necessary linked entities
 
@@ -251,16 +265,13 @@ KRString KRDBEntity::markedToDeleteHashKeyForEntityType(int64_t entityType, cons
 
 // ---- Annotations and key-value coding
 
-std::unordered_map<std::string, KRValue>& KRDBEntity::additionalInfo() {
-  if (!additionalInfo_) additionalInfo_ = std::make_unique<std::unordered_map<std::string, KRValue>>();
-  return *additionalInfo_;
-}
+std::unordered_map<std::string, KRValue>& KRDBEntity::additionalInfo() { return rare().additionalInfo; }
 
 KRValue KRDBEntity::valueForKey(const std::string& key) const {
   if (key == "markedToDelete") return markedToDelete_;
   if (key == "dbEntityChanged") return dbEntityChanged_;
   if (key == "entityID") return entityID_;
-  if (key == "favoriteAlias" || key == "favoriteAliasPrimitive") return favoriteAlias_;
+  if (key == "favoriteAlias" || key == "favoriteAliasPrimitive") return favoriteAliasPrimitive();
   if (key == "necesserryEntitiesToFetchCount") return necesserryEntitiesToFetchCount_;
   return KRAbstractModel::valueForKey(key);
 }

@@ -56,7 +56,7 @@ class KRDBEntity : public KRAbstractModel {
   // ---- Record
   const KRDBEntityIDPtr& entityID() const { return entityID_; }
   Record dbentity() const { return dbentity_; }
-  Record validationRecord() const { return validationRecord_; }
+  Record validationRecord() const { return rare_ ? rare_->validationRecord : nullptr; }
   // Refreshes the cached values from the record; false when the record does not suit the class.
   virtual bool storeInfoFromDBentity(const Record& record);
   // Takes the values of a fresher record of the same entity into the held record; false, changing
@@ -100,11 +100,9 @@ class KRDBEntity : public KRAbstractModel {
   void setNecesserryEntitiesToFetchCount(uint64_t count);
 
   // ---- Favorite alias
-  const std::shared_ptr<KRDBEntityFavoriteAlias>& favoriteAlias() const { return favoriteAlias_; }
-  const std::shared_ptr<KRDBEntityFavoriteAlias>& favoriteAliasPrimitive() const { return favoriteAlias_; }
-  void setFavoriteAliasPrimitive(std::shared_ptr<KRDBEntityFavoriteAlias> alias) {
-    favoriteAlias_ = std::move(alias);
-  }
+  const std::shared_ptr<KRDBEntityFavoriteAlias>& favoriteAlias() const { return favoriteAliasPrimitive(); }
+  const std::shared_ptr<KRDBEntityFavoriteAlias>& favoriteAliasPrimitive() const;
+  void setFavoriteAliasPrimitive(std::shared_ptr<KRDBEntityFavoriteAlias> alias);
   // Asks the context for the alias when there is none yet and points the alias back at this entity.
   void createFavoriteAliasIfNeeded();
 
@@ -164,15 +162,22 @@ class KRDBEntity : public KRAbstractModel {
   void notifyEntityWillChange(const KRDictionary& info);
   void notifyEntityDidChange(const KRDictionary& info);
 
-  std::shared_ptr<KRDBEntityFavoriteAlias> favoriteAlias_;
-  bool markedToDelete_ = false;
-  Record validationRecord_;
+  // What few entities carry, kept apart so that the millions of others do not pay for it: the
+  // favoriteAlias, the validationRecord and the additionalInfo annotations.
+  struct Rare {
+    std::shared_ptr<KRDBEntityFavoriteAlias> favoriteAlias;
+    Record validationRecord;
+    std::unordered_map<std::string, KRValue> additionalInfo;
+  };
+  Rare& rare();
+
   KRDBEntityIDPtr entityID_;
   Record dbentity_;
-  std::unique_ptr<std::unordered_map<std::string, KRValue>> additionalInfo_;
+  std::unique_ptr<Rare> rare_;
   std::unique_ptr<std::vector<Completion>> necessaryEntitiesFetchingCompletions_;
   uint64_t necesserryEntitiesToFetchCount_ = 0;
   std::weak_ptr<KRDBEntityContext> context_;
+  bool markedToDelete_ = false;
   bool dbEntityChanged_ = false;
 };
 

@@ -77,7 +77,7 @@ TEST_F(KRDBAdditionalFetchForImagesServiceTest, ImagesAskedBeforeTheMapsAreServe
 }
 
 TEST_F(KRDBAdditionalFetchForImagesServiceTest, AskingForTheMapsWhileTheyAreFetchedStartsNothingMore) {
-  store.images(1, folders);
+  const int64_t imageID = store.images(1, folders)[0]->entityID()->dbid();
   open();
   service->requestFetchingMaps();
   EXPECT_TRUE(service->isFetchingMaps());
@@ -85,10 +85,11 @@ TEST_F(KRDBAdditionalFetchForImagesServiceTest, AskingForTheMapsWhileTheyAreFetc
   ASSERT_TRUE(KRContextCatalog::runUntil([&] { return service->allFetchesCompleted(); }));
   EXPECT_FALSE(service->isFetchingMaps());
   const auto* attributes = &*service->imagesImageAttributesMap();
-  const auto firstAttributes = service->imagesImageAttributesMap()->begin()->second;
+  const auto firstAttributes = *service->imagesImageAttributesMap()->find(imageID);
+  ASSERT_NE(firstAttributes, nullptr);
   store.waitForQueue();
   EXPECT_EQ(&*service->imagesImageAttributesMap(), attributes);
-  EXPECT_EQ(service->imagesImageAttributesMap()->begin()->second, firstAttributes);
+  EXPECT_EQ(*service->imagesImageAttributesMap()->find(imageID), firstAttributes);
 }
 
 TEST_F(KRDBAdditionalFetchForImagesServiceTest, AnImageAskedAfterTheMapsIsServedAtOnce) {

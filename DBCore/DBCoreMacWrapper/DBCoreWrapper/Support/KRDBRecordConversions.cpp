@@ -5,7 +5,9 @@
 std::wstring KRDBRecordConversions::wideString(const KRString& string) { return string.krs_wstring(); }
 
 KRString KRDBRecordConversions::string(const std::wstring& wide) {
-  return KRString::krs_stringWithWString(wide);
+  // Records hold many empty texts; they all load as one shared object rather than one each.
+  static const KRString empty{std::string()};
+  return wide.empty() ? empty : KRString::krs_stringWithWString(wide);
 }
 
 int64_t KRDBRecordConversions::seconds(const KRDate& date) {

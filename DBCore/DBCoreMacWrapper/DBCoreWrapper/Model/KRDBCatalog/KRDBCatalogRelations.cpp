@@ -417,7 +417,7 @@ void KRDBCatalog::fetchCurrentStatesForImages(const KRDBEntityArray& images,
         if (!reactor) return states;
         for (const auto& [imageID, record] :
              reactor->GetCurrentStates<DBImage, DBImgHistoryState>(recordsOf<DBImage>(images)))
-          states[imageID] = KRDBImageState::initWithDBEntity(record);
+          states.emplace_hint(states.end(), imageID, KRDBImageState::initWithDBEntity(record));
         return states;
       },
       std::move(handler), sync);

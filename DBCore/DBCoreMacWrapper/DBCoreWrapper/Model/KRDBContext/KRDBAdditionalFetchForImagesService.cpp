@@ -50,19 +50,41 @@ void KRDBAdditionalFetchForImagesService::fastAdditionalFetchesForImage(
     fastAdditionalFetchesForImage(image);
     return handler();
   }
-  if (!fastFetchingCompletions_) fastFetchingCompletions_ = std::make_unique<std::vector<Handler>>();
-  fastFetchingCompletions_->push_back([weak = weakSelf(), image, handler = std::move(handler)] {
+  enqueueUntilMapsArrive([weak = weakSelf(), image, handler = std::move(handler)] {
     if (const auto service = weak.lock()) service->fastAdditionalFetchesForImage(image);
     handler();
   });
+}
+
+void KRDBAdditionalFetchForImagesService::fastAdditionalFetchesForImages(Images images, Handler handler) {
+  if (!handler) return;
+  auto attachAll = [weak = weakSelf(), images = std::move(images), handler = std::move(handler)] {
+    if (const auto service = weak.lock()) {
+      PathsByID paths;
+      for (const auto& image : *images) service->attach(image, paths);
+    }
+    handler();
+  };
+  if (allFetchesCompleted()) return attachAll();
+  enqueueUntilMapsArrive(std::move(attachAll));
+}
+
+void KRDBAdditionalFetchForImagesService::enqueueUntilMapsArrive(Handler callback) {
+  if (!fastFetchingCompletions_) fastFetchingCompletions_ = std::make_unique<std::vector<Handler>>();
+  fastFetchingCompletions_->push_back(std::move(callback));
   requestFetchingMaps();
 }
 
 void KRDBAdditionalFetchForImagesService::fastAdditionalFetchesForImage(
     const std::shared_ptr<KRDBImage>& image) {
+  PathsByID paths;
+  attach(image, paths);
+}
+
+void KRDBAdditionalFetchForImagesService::attach(const std::shared_ptr<KRDBImage>& image, PathsByID& paths) {
   if (!image || !allFetchesCompleted()) return;
   const int64_t imageID = image->entityID()->dbid();
-  attachPath(image, imageID);
+  attachPath(image, imageID, paths);
   if (const auto attributes = entryOf(*imagesImageAttributesMap_, imageID)) {
     attributes->setImagePrimitive(image);
     image->setAttributesPrimitive(attributes);
@@ -74,13 +96,18 @@ void KRDBAdditionalFetchForImagesService::fastAdditionalFetchesForImage(
   if (const auto state = entryOf(*imagesCurrentStatesMap_, imageID)) image->setCurrentStatePrimitive(state);
 }
 
-void KRDBAdditionalFetchForImagesService::attachPath(const std::shared_ptr<KRDBImage>& image,
-                                                     int64_t imageID) {
+void KRDBAdditionalFetchForImagesService::attachPath(const std::shared_ptr<KRDBImage>& image, int64_t imageID,
+                                                     PathsByID& paths) {
   const int64_t* pathID = imagesPathesMap_->find(imageID);
-  const auto context = context_.lock();
-  if (!pathID || !context) return;
-  const auto path = context->entityWithID(KRDBEntityID::initWithEntityType(KRDBEntityTypePath, *pathID));
-  image->setFolderDBPathPrimitive(std::static_pointer_cast<KRDBPath>(path));
+  if (!pathID) return;
+  auto& path = paths[*pathID];
+  if (!path) {
+    const auto context = context_.lock();
+    if (!context) return;
+    path = std::static_pointer_cast<KRDBPath>(
+        context->entityWithID(KRDBEntityID::initWithEntityType(KRDBEntityTypePath, *pathID)));
+  }
+  image->setFolderDBPathPrimitive(path);
 }
 
 // ---- Maps
@@ -89,10 +116,12 @@ void KRDBAdditionalFetchForImagesService::requestFetchingMaps() {
   const auto context = context_.lock();
   if (fetchingMaps_ || !context) return;
   fetchingMaps_ = true;
+  // The catalog's queue serves them in this order, and the main thread takes each as it arrives; the maps
+  // whose taking costs the main thread most come first, so that the queue's later work hides it.
   fetchPathesMap(context);
-  fetchAttributesMap(context);
-  fetchExivAttributesMap(context);
   fetchCurrentStatesMap(context);
+  fetchExivAttributesMap(context);
+  fetchAttributesMap(context);
 }
 
 template <class Result>
@@ -107,16 +136,26 @@ std::function<void(Result)> KRDBAdditionalFetchForImagesService::storing(
 }
 
 void KRDBAdditionalFetchForImagesService::fetchPathesMap(const std::shared_ptr<KRDBContext>& context) {
-  std::weak_ptr<KRDBContext> weakContext = context;
-  const auto store = storing(&KRDBAdditionalFetchForImagesService::storePathes);
+  struct Pending {
+    std::optional<KRDictionary> connections;
+    bool pathsCached = false;
+  };
+  const auto pending = std::make_shared<Pending>();
+  const auto storeWhenBothArrived = [pending,
+                                     store = storing(&KRDBAdditionalFetchForImagesService::storePathes)] {
+    if (pending->connections && pending->pathsCached) store(std::move(*pending->connections));
+  };
+  // Folder paths are not fetched by identifier: they are cached alongside, so that attaching an image's
+  // path finds it in the context's cache.
+  context->obtainEntitiesUsingFetchRequest(KRDBFilteredPathsFetchRequest::init(),
+                                           [pending, storeWhenBothArrived](KRDBEntitySet) {
+                                             pending->pathsCached = true;
+                                             storeWhenBothArrived();
+                                           });
   context->catalog()->fetchConnectionsForImagesWithDBPathesWithHandler(
-      [weakContext, store](KRDictionary connections) {
-        const auto context = weakContext.lock();
-        if (!context) return;
-        // Folder paths are not fetched by identifier: they are cached first, so that attaching an image's
-        // path finds it in the context's cache.
-        context->obtainEntitiesUsingFetchRequest(KRDBFilteredPathsFetchRequest::init(),
-                                                 [store, connections](KRDBEntitySet) { store(connections); });
+      [pending, storeWhenBothArrived](KRDictionary connections) {
+        pending->connections = std::move(connections);
+        storeWhenBothArrived();
       });
 }
 

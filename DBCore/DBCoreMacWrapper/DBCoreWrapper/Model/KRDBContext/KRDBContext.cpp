@@ -127,29 +127,43 @@ std::shared_ptr<KRDBEntity> KRDBContext::preparedEntity(const std::shared_ptr<KR
   return instance;
 }
 
+// The bookkeeping of one preparedEntities call: the handler gets the result once every input entity is
+// prepared.
+struct KRDBContext::PreparationProgress {
+  KRDBEntitySet result;
+  size_t finished = 0;
+  size_t expected = 0;
+  EntitiesHandler handler;
+  void finish(size_t count) {
+    finished += count;
+    if (finished == expected && handler) handler(std::move(result));
+  }
+};
+
 void KRDBContext::preparedEntities(KRDBEntitySet entities, EntitiesHandler handler) {
-  struct Progress {
-    KRDBEntitySet result;
-    size_t finished = 0;
-    size_t expected = 0;
-    EntitiesHandler handler;
-    void finishOne() {
-      if (++finished == expected && handler) handler(std::move(result));
-    }
-  };
-  const auto progress = std::make_shared<Progress>();
+  const auto progress = std::make_shared<PreparationProgress>();
   progress->expected = entities.size();
   progress->handler = std::move(handler);
+  size_t preparedAtOnce = 0;
+  auto images = std::make_shared<std::vector<std::shared_ptr<KRDBImage>>>();
   // The set becomes the result: only the members that are not their own cached instance are replaced, so
   // a freshly fetched million is not copied.
   std::vector<std::pair<std::shared_ptr<KRDBEntity>, std::shared_ptr<KRDBEntity>>> replaced;
   for (const auto& entity : entities) {
-    const auto instance = entity ? cachedOrCachingInstance(entity) : nullptr;
+    auto instance = entity ? cachedEntityForEntityID(entity->entityID()) : nullptr;
+    if (!instance && entity) {
+      instance = entity;
+      if (joinsImageBatch(*entity)) {
+        cacheForImageBatch(entity, *images);
+        continue;
+      }
+      if (entity->entityID()) cacheUncachedEntity(entity);
+    }
     if (instance != entity || !entity) replaced.emplace_back(entity, instance);
     if (instance && instance->necesserryEntitiesToFetchCount() != 0) {
-      instance->pushCompletionFetchingNecessaryEntities([progress] { progress->finishOne(); });
+      instance->pushCompletionFetchingNecessaryEntities([progress] { progress->finish(1); });
     } else {
-      ++progress->finished;
+      ++preparedAtOnce;
     }
   }
   for (const auto& [fetched, instance] : replaced) {
@@ -157,8 +171,51 @@ void KRDBContext::preparedEntities(KRDBEntitySet entities, EntitiesHandler handl
     if (instance) entities.insert(instance);
   }
   progress->result = std::move(entities);
-  if (progress->handler && progress->finished == progress->expected)
-    progress->handler(std::move(progress->result));
+  progress->finish(preparedAtOnce);
+  if (!images->empty()) fetchLinkedEntitiesOfImageBatch(std::move(images), progress);
+}
+
+bool KRDBContext::joinsImageBatch(const KRDBEntity& entity) const {
+  return entity.entityID() && entity.entityID()->entityType() == KRDBEntityTypeImage &&
+         entity.needFetchNecessaryEntities();
+}
+
+void KRDBContext::cacheForImageBatch(const std::shared_ptr<KRDBEntity>& image,
+                                     std::vector<std::shared_ptr<KRDBImage>>& batch) {
+  fetchedEntities_->setEntity(image, image->entityID());
+  image->setNecesserryEntitiesToFetchCount(image->entityClass().necessaryLinkedEntitiesKeys().size());
+  batch.push_back(std::static_pointer_cast<KRDBImage>(image));
+}
+
+void KRDBContext::fetchLinkedEntitiesOfImageBatch(KRDBAdditionalFetchForImagesService::Images images,
+                                                  const std::shared_ptr<PreparationProgress>& progress) {
+  std::weak_ptr<KRDBContext> weak = weakSelf();
+  additionalFetchForImagesService_->fastAdditionalFetchesForImages(images, [weak, images, progress] {
+    const auto context = weak.lock();
+    if (!context) return;
+    size_t prepared = 0;
+    for (const auto& image : *images) prepared += context->finishFastFetch(image, progress) ? 1 : 0;
+    progress->finish(prepared);
+  });
+}
+
+bool KRDBContext::finishFastFetch(const std::shared_ptr<KRDBImage>& image,
+                                  const std::shared_ptr<PreparationProgress>& progress) {
+  if (image->needFetchNecessaryEntities()) {
+    // The maps lacked a link: the image is prepared, before whatever else waits on it, once the catalog
+    // delivered the rest.
+    std::weak_ptr<KRDBContext> weak = weakSelf();
+    auto& waiting = image->necessaryEntitiesFetchingCompletions();
+    waiting.insert(waiting.begin(), [weak, image] {
+      if (const auto context = weak.lock()) context->prepareFetchedEntity(image);
+    });
+    image->pushCompletionFetchingNecessaryEntities([progress] { progress->finish(1); });
+    fetchLinkedEntitiesFromCatalog(image);
+    return false;
+  }
+  prepareFetchedEntity(image);
+  image->setNecesserryEntitiesToFetchCount(0);
+  return true;
 }
 
 void KRDBContext::additionalFetchingForEntity(const std::shared_ptr<KRDBEntity>& entity) {
@@ -168,13 +225,18 @@ void KRDBContext::additionalFetchingForEntity(const std::shared_ptr<KRDBEntity>&
     const auto context = weak.lock();
     if (!context) return;
     if (!entity->needFetchNecessaryEntities()) return entity->setNecesserryEntitiesToFetchCount(0);
-    context->catalog_->additionalFetchingForEntities(
-        {entity},
-        [weak, entity](KRDBEntitySet linked) {
-          if (const auto context = weak.lock()) context->takeLinkedEntities(entity, linked);
-        },
-        false);
+    context->fetchLinkedEntitiesFromCatalog(entity);
   });
+}
+
+void KRDBContext::fetchLinkedEntitiesFromCatalog(const std::shared_ptr<KRDBEntity>& entity) {
+  std::weak_ptr<KRDBContext> weak = weakSelf();
+  catalog_->additionalFetchingForEntities(
+      {entity},
+      [weak, entity](KRDBEntitySet linked) {
+        if (const auto context = weak.lock()) context->takeLinkedEntities(entity, linked);
+      },
+      false);
 }
 
 void KRDBContext::takeLinkedEntities(const std::shared_ptr<KRDBEntity>& entity, const KRDBEntitySet& linked) {

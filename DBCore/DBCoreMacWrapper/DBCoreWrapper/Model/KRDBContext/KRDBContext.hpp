@@ -149,6 +149,19 @@ class KRDBContext : public KRAbstractModel, public KRDBEntityContext, public KRD
   std::weak_ptr<KRDBContext> weakSelf() { return selfPtr(); }
   // Turns the current run loop until the entity's linked records are attached.
   static void waitForNecessaryEntities(const std::shared_ptr<KRDBEntity>& entity);
+  // Uncached images that preparedEntities takes together wait for the additional-fetch service's maps as
+  // one batch rather than with callbacks of their own; those the maps cannot complete go on to the catalog.
+  struct PreparationProgress;
+  bool joinsImageBatch(const KRDBEntity& entity) const;
+  void cacheForImageBatch(const std::shared_ptr<KRDBEntity>& image,
+                          std::vector<std::shared_ptr<KRDBImage>>& batch);
+  void fetchLinkedEntitiesOfImageBatch(std::shared_ptr<const std::vector<std::shared_ptr<KRDBImage>>> images,
+                                       const std::shared_ptr<PreparationProgress>& progress);
+  // Prepares an attached image and answers true, or hands it to the catalog for what the maps lacked.
+  bool finishFastFetch(const std::shared_ptr<KRDBImage>& image,
+                       const std::shared_ptr<PreparationProgress>& progress);
+  // The catalog's additional fetching for one entity; its count follows the linked entities' preparation.
+  void fetchLinkedEntitiesFromCatalog(const std::shared_ptr<KRDBEntity>& entity);
   // cacheEntityAndFetchLinkedEntities for an entity known not to be cached.
   void cacheUncachedEntity(const std::shared_ptr<KRDBEntity>& entity);
   // The cached instance of an entity, caching (and starting the preparation of) the entity on a miss.

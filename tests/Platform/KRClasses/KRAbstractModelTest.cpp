@@ -183,3 +183,31 @@ TEST(KRAbstractModelTest, AsyncMainThreadBlockRunsLaterEvenOnTheMainThread) {
   EXPECT_TRUE(runMainLoopUntil([&order] { return order.size() == 2; }));
   EXPECT_EQ(order, (std::vector<int>{1, 2}));
 }
+
+TEST(KRAbstractModelTest, AGoneOnlyObserverLeavesItsPlaceToTheNextOne) {
+  std::vector<std::string> log;
+  auto model = std::make_shared<Model>();
+  auto gone = std::make_shared<Recorder>("gone", &log);
+  model->addListener(gone);
+  gone.reset();
+  auto next = std::make_shared<Recorder>("next", &log);
+  model->addListener(next);
+  EXPECT_EQ(model->listeners(), (std::vector<std::shared_ptr<KRObject>>{next}));
+  model->removeListener(next);
+  EXPECT_TRUE(model->listeners().empty());
+  EXPECT_FALSE(model->hasListener(next));
+}
+
+TEST(KRAbstractModelTest, ObserversKeepTheirOrderWhenTheFirstIsRemovedFromMany) {
+  std::vector<std::string> log;
+  auto model = std::make_shared<Model>();
+  std::vector<std::shared_ptr<Recorder>> recorders;
+  for (const char* name : {"a", "b", "c"}) {
+    recorders.push_back(std::make_shared<Recorder>(name, &log));
+    model->addListener(recorders.back());
+  }
+  model->removeListener(recorders[0]);
+  model->addListener(recorders[0]);
+  model->notifyObserversWithSelector(&ChangeObserver::modelDidChange, model.get(), KRDictionary{{"key", 7}});
+  EXPECT_EQ(log, (std::vector<std::string>{"b:7", "c:7", "a:7"}));
+}

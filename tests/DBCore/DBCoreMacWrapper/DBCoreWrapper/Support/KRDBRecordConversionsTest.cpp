@@ -36,4 +36,12 @@ TEST(KRDBRecordConversionsTest, StringsCrossAsWideStringsLosslessly) {
   EXPECT_EQ(Conversions::string(L""), KRString(""));
 }
 
+TEST(KRDBRecordConversionsTest, EmptyTextsLoadAsOneSharedStringAndOthersEachAsTheirOwn) {
+  const KRString empty = Conversions::string(L"");
+  EXPECT_FALSE(empty.isNil());
+  EXPECT_TRUE(identical(empty, Conversions::string(L"")));
+  EXPECT_FALSE(identical(empty, KRString("")));
+  EXPECT_FALSE(identical(Conversions::string(L"a"), Conversions::string(L"a")));
+}
+
 }  // namespace

@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include <memory>
+#include <string>
 #include <vector>
 
 #include "KRContextCatalog.hpp"
@@ -105,6 +106,41 @@ TEST_F(KRDBAdditionalFetchForImagesServiceTest, AnImageAskedAfterTheMapsIsServed
   ASSERT_TRUE(image->folderDBPathPrimitive());
   EXPECT_EQ(image->folderDBPathPrimitive(),
             context->cachedEntityForEntityID(image->folderDBPathPrimitive()->entityID()));
+}
+
+TEST_F(KRDBAdditionalFetchForImagesServiceTest, ABatchWaitsAsOneCallbackInTheQueueOfSingleImages) {
+  const auto images = store.images(3, folders);
+  open();
+  std::vector<std::string> calls;
+  const auto single = bare(images[0]);
+  const auto batch = std::make_shared<std::vector<ImagePtr>>(std::vector{bare(images[1]), bare(images[2])});
+  service->fastAdditionalFetchesForImages(batch, [&] {
+    calls.push_back("batch");
+    for (const auto& image : *batch) expectAllLinks(image);
+  });
+  service->fastAdditionalFetchesForImage(single, [&] { calls.push_back("single"); });
+  EXPECT_TRUE(service->isFetchingMaps());
+  EXPECT_TRUE(calls.empty());
+  ASSERT_TRUE(KRContextCatalog::runUntil([&] { return calls.size() == 2; }));
+  EXPECT_EQ(calls, (std::vector<std::string>{"batch", "single"}));
+  expectAllLinks(single);
+  // Both images of the batch share the cached instance of their folder path where they share the folder.
+  EXPECT_EQ((*batch)[0]->folderDBPathPrimitive(),
+            context->cachedEntityForEntityID((*batch)[0]->folderDBPathPrimitive()->entityID()));
+}
+
+TEST_F(KRDBAdditionalFetchForImagesServiceTest, ABatchAfterTheMapsIsServedAtOnceAndNeedsAHandler) {
+  const auto images = store.images(2, folders);
+  open();
+  service->fastAdditionalFetchesForImages(std::make_shared<std::vector<ImagePtr>>(), nullptr);
+  EXPECT_FALSE(service->isFetchingMaps());
+  service->requestFetchingMaps();
+  ASSERT_TRUE(KRContextCatalog::runUntil([&] { return service->allFetchesCompleted(); }));
+  const auto batch = std::make_shared<std::vector<ImagePtr>>(std::vector{bare(images[0]), bare(images[1])});
+  bool called = false;
+  service->fastAdditionalFetchesForImages(batch, [&] { called = true; });
+  EXPECT_TRUE(called);
+  for (const auto& image : *batch) expectAllLinks(image);
 }
 
 TEST_F(KRDBAdditionalFetchForImagesServiceTest, WithoutAHandlerNothingHappens) {

@@ -215,6 +215,59 @@ TEST_F(KRDBContextTest, AnImageNotInTheMapsGetsItsLinksTheOrdinaryWay) {
   EXPECT_FALSE(image->needFetchNecessaryEntities());
 }
 
+TEST_F(KRDBContextTest, ImagesPreparedBeforeTheMapsArriveAreHandedOverOnceAllAreLinked) {
+  KRDBEntitySet fetched;
+  for (const auto& image : images) fetched.insert(store.catalog()->fetchEntityWithID(image->entityID()));
+  int calls = 0;
+  KRDBEntitySet result;
+  context->preparedEntities(fetched, [&](KRDBEntitySet entities) {
+    ++calls;
+    result = std::move(entities);
+  });
+  EXPECT_EQ(calls, 0);
+  ASSERT_TRUE(KRContextCatalog::runUntil([&] { return calls == 1; }));
+  EXPECT_EQ(result, fetched);
+  for (const auto& entity : result) {
+    const auto image = std::static_pointer_cast<KRDBImage>(entity);
+    EXPECT_EQ(context->cachedEntityForEntityID(image->entityID()), image);
+    EXPECT_EQ(image->necesserryEntitiesToFetchCount(), 0u);
+    EXPECT_TRUE(image->folderDBPath() && image->attributesPrimitive() && image->exivAttributesPrimitive());
+    EXPECT_EQ(image->context(), context);
+  }
+  store.waitForQueue();
+  EXPECT_EQ(calls, 1);
+}
+
+TEST_F(KRDBContextTest, AnImageWaitingInABatchIsPreparedForAnotherCallerToo) {
+  const auto copy = store.catalog()->fetchEntityWithID(images[1]->entityID());
+  bool called = false;
+  context->preparedEntities({copy}, [&](KRDBEntitySet) { called = true; });
+  const auto image = imageWithID(images[1]);
+  EXPECT_EQ(image, copy);
+  EXPECT_TRUE(image->attributesPrimitive());
+  EXPECT_EQ(image->context(), context);
+  EXPECT_TRUE(KRContextCatalog::runUntil([&] { return called; }));
+}
+
+TEST_F(KRDBContextTest, AnImageOfABatchTheMapsLackGetsItsLinksTheOrdinaryWay) {
+  imageWithID(images[0]);
+  ASSERT_TRUE(context->additionalFetchForImagesService()->allFetchesCompleted());
+  const auto later = store.catalog()->fetchEntityWithID(store.images(1, folders).at(0)->entityID());
+  bool called = false;
+  context->preparedEntities({later}, [&](KRDBEntitySet entities) {
+    called = true;
+    EXPECT_EQ(entities, KRDBEntitySet{later});
+  });
+  ASSERT_TRUE(KRContextCatalog::runUntil([&] { return called; }));
+  const auto image = std::static_pointer_cast<KRDBImage>(later);
+  EXPECT_TRUE(image->attributesPrimitive());
+  EXPECT_TRUE(image->exivAttributesPrimitive());
+  EXPECT_TRUE(image->folderDBPath());
+  EXPECT_FALSE(image->needFetchNecessaryEntities());
+  EXPECT_EQ(image->context(), context);
+  EXPECT_EQ(context->cachedEntityForEntityID(image->entityID()), image);
+}
+
 // ---- Waiting, closing, backup
 
 TEST_F(KRDBContextTest, WaitingForChangesCallsTheHandlerAtOnceWhenNoPassIsPending) {

@@ -16,6 +16,7 @@
 #include "Model/KRDBEntity/KRDBEntityID.hpp"
 
 namespace dbcore {
+class DBEntity;
 class DBReactor;
 }
 class KRDBEntity;
@@ -281,6 +282,9 @@ class KRDBCatalog : public KRAbstractModel {
   // The entities that the request selects; an empty set (and a logged error) for a type that cannot be
   // fetched by request, an empty set for a request without a query of the type's class.
   KRDBEntitySet fetchEntitiesUsingFetchRequestSync(const FetchRequestPtr& request);
+  // The records behind fetchEntitiesUsingFetchRequestSync, before they become entities.
+  using Records = std::vector<std::shared_ptr<dbcore::DBEntity>>;
+  Records fetchRecordsUsingFetchRequestSync(const FetchRequestPtr& request);
   KRDBEntitySet fetchImagesUsingFetchRequestSync(const FetchRequestPtr& request);
   KRDBEntitySet fetchReffoldersUsingFetchRequestSync(const FetchRequestPtr& request);
   KRDBEntitySet fetchPathsUsingFetchRequestSync(const FetchRequestPtr& request);

@@ -30,20 +30,30 @@ namespace {
 
 using namespace dbcore;
 
-// The entities of the records that a request of query class Query selects; empty for a request without a
-// query of that class or a catalog without an engine. Engine exceptions pass (no guard on this path).
+// The records that a request of query class Query selects; none for a request without a query of that
+// class or a catalog without an engine. Engine exceptions pass (no guard on this path).
 template <class Query, class Record>
-KRDBEntitySet fetchWithRequest(KRDBCatalog& catalog, const KRDBCatalog::FetchRequestPtr& request) {
-  KRDBEntitySet entities;
+KRDBCatalog::Records recordsWithRequest(KRDBCatalog& catalog, const KRDBCatalog::FetchRequestPtr& request) {
   const auto query = request ? std::dynamic_pointer_cast<Query>(request->selectQuery()) : nullptr;
   const auto reactor = catalog.dbReactor();
-  if (!query || !reactor) return entities;
-  const auto records = reactor->GetBySelectQuery<Record>(query);
+  if (!query || !reactor) return {};
+  auto records = reactor->GetBySelectQuery<Record>(query);
+  return {std::make_move_iterator(records.begin()), std::make_move_iterator(records.end())};
+}
+
+// The entities of the records.
+KRDBEntitySet entitiesOf(const KRDBCatalog::Records& records) {
+  KRDBEntitySet entities;
   entities.reserve(records.size());
   for (const auto& record : records) {
     if (auto entity = KRDBEntity::entityWithDBEntity(record)) entities.insert(std::move(entity));
   }
   return entities;
+}
+
+template <class Query, class Record>
+KRDBEntitySet fetchWithRequest(KRDBCatalog& catalog, const KRDBCatalog::FetchRequestPtr& request) {
+  return entitiesOf(recordsWithRequest<Query, Record>(catalog, request));
 }
 
 // Adds the linked entity to the array when there is one.
@@ -56,28 +66,36 @@ void safeAddObject(KRDBEntityArray& array, const std::shared_ptr<T>& entity) {
 
 void KRDBCatalog::obtainFetchedEntitiesUsingFetchRequest(const FetchRequestPtr& request,
                                                          ResultHandler<KRDBEntitySet> handler, bool sync) {
-  performOperation<KRDBEntitySet>(
-      [request](KRDBCatalog& catalog) { return catalog.fetchEntitiesUsingFetchRequestSync(request); },
-      std::move(handler), sync);
+  // The queue only reads the records; the entities are built where the handler runs, so that the queue
+  // goes on with the next operation meanwhile.
+  ResultHandler<Records> building;
+  if (handler) building = [handler = std::move(handler)](Records records) { handler(entitiesOf(records)); };
+  performOperation<Records>(
+      [request](KRDBCatalog& catalog) { return catalog.fetchRecordsUsingFetchRequestSync(request); },
+      std::move(building), sync);
 }
 
 KRDBEntitySet KRDBCatalog::fetchEntitiesUsingFetchRequestSync(const FetchRequestPtr& request) {
+  return entitiesOf(fetchRecordsUsingFetchRequestSync(request));
+}
+
+KRDBCatalog::Records KRDBCatalog::fetchRecordsUsingFetchRequestSync(const FetchRequestPtr& request) {
   const int64_t entityType = request ? request->entityType() : KRDBEntityTypeNone;
   switch (entityType) {
     case KRDBEntityTypeImage:
-      return fetchImagesUsingFetchRequestSync(request);
+      return recordsWithRequest<DBImgSelectQuery, DBImage>(*this, request);
     case KRDBEntityTypeReferencedFolder:
-      return fetchReffoldersUsingFetchRequestSync(request);
+      return recordsWithRequest<DBEntityReffolderSelectQuery, DBRefFolder>(*this, request);
     case KRDBEntityTypePath:
-      return fetchPathsUsingFetchRequestSync(request);
+      return recordsWithRequest<DBPathSelectQuery, DBPath>(*this, request);
     case KRDBEntityTypeImageAttributes:
-      return fetchImageAttributesUsingFetchRequestSync(request);
+      return recordsWithRequest<DBUserImgAttribSelectQuery, DBUserImgAttrib>(*this, request);
     case KRDBEntityTypeImageExivAttributes:
-      return fetchImageExivAttributesUsingFetchRequestSync(request);
+      return recordsWithRequest<DBExivImgAttribSelectQuery, DBExivImgAttrib>(*this, request);
     case KRDBEntityTypeFavoriteAlias:
-      return fetchFavoriteAliasUsingFetchRequestSync(request);
+      return recordsWithRequest<DBEntityFavoriteAliasSelectQuery, DBEntityFavoriteAlias>(*this, request);
     case KRDBEntityTypeVolume:
-      return fetchVolumesUsingFetchRequestSync(request);
+      return recordsWithRequest<DBVolumeSelectQuery, DBVolume>(*this, request);
     default:
       KRLog(KRLogLevelError, "Error: %@ for entity type: %ld does not implemented yet.",
             "fetchEntitiesUsingFetchRequestSync:", static_cast<long>(entityType));
@@ -116,18 +134,26 @@ KRDBEntitySet KRDBCatalog::fetchVolumesUsingFetchRequestSync(const FetchRequestP
 // ---- Image-to-folder table
 
 void KRDBCatalog::fetchConnectionsForImagesWithDBPathesWithHandler(ResultHandler<KRDictionary> handler) {
-  performOperation<KRDictionary>(
+  using Connections = std::map<long long, std::set<long long>>;
+  // The queue only reads the table; the dictionary is built where the handler runs.
+  ResultHandler<Connections> building;
+  if (handler) {
+    building = [handler = std::move(handler)](Connections connections) {
+      std::vector<KRDictionary::Entry> entries;
+      entries.reserve(connections.size());
+      for (const auto& [imageId, pathIds] : connections) {
+        if (!pathIds.empty())
+          entries.emplace_back(static_cast<int64_t>(imageId), static_cast<int64_t>(*pathIds.begin()));
+      }
+      handler(KRDictionary(entries));
+    };
+  }
+  performOperation<Connections>(
       [](KRDBCatalog& catalog) {
-        std::vector<KRDictionary::Entry> entries;
-        if (const auto reactor = catalog.dbReactor()) {
-          for (const auto& [imageId, pathIds] : reactor->Connections<DBPath, DBImage>(true)) {
-            if (!pathIds.empty())
-              entries.emplace_back(static_cast<int64_t>(imageId), static_cast<int64_t>(*pathIds.begin()));
-          }
-        }
-        return KRDictionary(entries);
+        const auto reactor = catalog.dbReactor();
+        return reactor ? reactor->Connections<DBPath, DBImage>(true) : Connections{};
       },
-      std::move(handler), false);
+      std::move(building), false);
 }
 
 // ---- Additional fetching

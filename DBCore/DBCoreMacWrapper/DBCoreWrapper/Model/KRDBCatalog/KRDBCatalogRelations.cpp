@@ -410,17 +410,24 @@ std::shared_ptr<KRDBImageState> KRDBCatalog::fetchCurrentStateForImage(
 
 void KRDBCatalog::fetchCurrentStatesForImages(const KRDBEntityArray& images,
                                               ResultHandler<ImageStatesByID> handler, bool sync) {
-  performOperation<ImageStatesByID>(
+  using StateRecords = std::map<long long, std::shared_ptr<DBImgHistoryState>>;
+  // The queue only reads the records; the entities are built where the handler runs.
+  ResultHandler<StateRecords> building;
+  if (handler) {
+    building = [handler = std::move(handler)](StateRecords records) {
+      ImageStatesByID states;
+      for (const auto& [imageID, record] : records)
+        states.emplace_hint(states.end(), imageID, KRDBImageState::initWithDBEntity(record));
+      handler(std::move(states));
+    };
+  }
+  performOperation<StateRecords>(
       [images](KRDBCatalog& catalog) {
         const Reactor reactor = catalog.dbReactor();
-        ImageStatesByID states;
-        if (!reactor) return states;
-        for (const auto& [imageID, record] :
-             reactor->GetCurrentStates<DBImage, DBImgHistoryState>(recordsOf<DBImage>(images)))
-          states.emplace_hint(states.end(), imageID, KRDBImageState::initWithDBEntity(record));
-        return states;
+        if (!reactor) return StateRecords{};
+        return reactor->GetCurrentStates<DBImage, DBImgHistoryState>(recordsOf<DBImage>(images));
       },
-      std::move(handler), sync);
+      std::move(building), sync);
 }
 
 void KRDBCatalog::setStates(const KRDBImageStates& states,

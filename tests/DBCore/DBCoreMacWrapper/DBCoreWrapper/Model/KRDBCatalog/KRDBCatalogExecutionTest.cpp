@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <functional>
 #include <optional>
+#include <set>
 
 #include "KRFoundation/KRRunLoop.hpp"
 #include "KRServices/KRCapturingLogSink.hpp"
@@ -99,6 +100,19 @@ TEST_F(KRDBCatalogExecutionTest, AnImageRequestFetchesFreshImageEntities) {
     EXPECT_EQ(std::count(images.begin(), images.end(), entity), 0);
     EXPECT_EQ(image->name().str().rfind("IMG_", 0), 0u);
   }
+}
+
+TEST_F(KRDBCatalogExecutionTest, TheRecordsOfARequestAreThoseItsEntitiesHold) {
+  makeImages(3);
+  const auto request = KRDBFilteredImagesFetchRequest::init();
+  const auto records = onQueue<KRDBCatalog::Records>(
+      [&](KRDBCatalog& queue) { return queue.fetchRecordsUsingFetchRequestSync(request); });
+  std::set<int64_t> recordIDs;
+  for (const auto& record : records) recordIDs.insert(record->id());
+  std::set<int64_t> entityIDs;
+  for (const auto& entity : fetch(request)) entityIDs.insert(entity->entityID()->dbid());
+  EXPECT_EQ(recordIDs.size(), 3u);
+  EXPECT_EQ(recordIDs, entityIDs);
 }
 
 TEST_F(KRDBCatalogExecutionTest, PathAndVolumeRequestsFetchTheirRecords) {

@@ -108,6 +108,11 @@ bool KRAbstractModel::hasListener(const std::shared_ptr<KRObject>& listener) con
   return positionOf(listener.get()) != kNotListed;
 }
 
+bool KRAbstractModel::hasListeners() const {
+  std::lock_guard held(lock());
+  return moreListeners_ ? !moreListeners_->entries.empty() : !onlyListener_.expired();
+}
+
 std::vector<std::shared_ptr<KRObject>> KRAbstractModel::listeners() const {
   std::lock_guard held(lock());
   std::vector<std::shared_ptr<KRObject>> live;

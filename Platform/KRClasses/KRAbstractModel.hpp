@@ -23,6 +23,8 @@ class KRAbstractModel : public KRObject {
   void addListener(const std::shared_ptr<KRObject>& listener);
   void removeListener(const std::shared_ptr<KRObject>& listener);
   bool hasListener(const std::shared_ptr<KRObject>& listener) const;
+  // Whether any observer is registered (one that is gone may still count until it is dropped).
+  bool hasListeners() const;
   // The live observers in registration order.
   std::vector<std::shared_ptr<KRObject>> listeners() const;
 

@@ -211,3 +211,18 @@ TEST(KRAbstractModelTest, ObserversKeepTheirOrderWhenTheFirstIsRemovedFromMany) 
   model->notifyObserversWithSelector(&ChangeObserver::modelDidChange, model.get(), KRDictionary{{"key", 7}});
   EXPECT_EQ(log, (std::vector<std::string>{"b:7", "c:7", "a:7"}));
 }
+
+TEST(KRAbstractModelTest, HasListenersWhileAnyIsRegistered) {
+  std::vector<std::string> log;
+  auto model = std::make_shared<Model>();
+  EXPECT_FALSE(model->hasListeners());
+  auto a = std::make_shared<Recorder>("a", &log);
+  auto b = std::make_shared<Recorder>("b", &log);
+  model->addListener(a);
+  EXPECT_TRUE(model->hasListeners());
+  model->addListener(b);
+  model->removeListener(a);
+  EXPECT_TRUE(model->hasListeners());
+  model->removeListener(b);
+  EXPECT_FALSE(model->hasListeners());
+}

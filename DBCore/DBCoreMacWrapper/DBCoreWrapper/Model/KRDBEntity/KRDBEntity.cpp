@@ -148,7 +148,10 @@ void KRDBEntity::didChange(const KRDictionary& info) {
                                        : info.dictionaryByRemovingObjectForKey(kKRDBEntityDidNotChange));
 }
 
-void KRDBEntity::didChangeWithoutRecord() { didChange({{kKRDBEntityDidNotChange, true}}); }
+void KRDBEntity::didChangeWithoutRecord() {
+  // Such a change only informs the observers: without any, there is nothing to build.
+  if (hasListeners()) didChange({{kKRDBEntityDidNotChange, true}});
+}
 
 void KRDBEntity::notifyEntityWillChange(const KRDictionary& info) {
   notifyObserversWithSelector(&KRDBEntityObserver::entityWillChange, self(), info);

@@ -2,6 +2,8 @@
 
 #include <vector>
 
+#include "Support/KRDBInternedStrings.hpp"
+
 using dbcore::DBImgHistoryState;
 
 const char* const kKRDBImageStateDidChangeActionName = "kKRDBImageStateDidChangeActionName";
@@ -33,7 +35,8 @@ bool KRDBImageState::storeInfoFromDBentity(const Record& record) {
 
 bool KRDBImageState::storeInfoFromDBState(const std::shared_ptr<DBImgHistoryState>& state) {
   const DBImgHistoryState& record = *state;
-  load(actionName_, record, &DBImgHistoryState::action_name);
+  // Action names repeat across the states of a catalog ("Import", "Crop", ...): one object each.
+  actionName_ = KRDBInternedStrings::string(record.action_name);
   load(additionalInfo_, record, &DBImgHistoryState::additional_info);
   load(guid_, record, &DBImgHistoryState::guid);
   cropDesc_ = cropFromText(record.crop_description);

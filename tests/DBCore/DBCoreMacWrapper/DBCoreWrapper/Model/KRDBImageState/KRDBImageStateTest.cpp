@@ -67,6 +67,14 @@ TEST(KRDBImageStateTest, TheRecordGivesEveryFieldAndTheCropFromItsText) {
   EXPECT_TRUE(state->isOriginal());
 }
 
+TEST(KRDBImageStateTest, StatesLoadedWithOneActionNameShareItsObjectButNotTheirGuids) {
+  const auto first = makeState();
+  const auto second = makeState();
+  EXPECT_TRUE(identical(first->actionName(), second->actionName()));
+  EXPECT_FALSE(identical(first->guid(), second->guid()));
+  EXPECT_EQ(first->guid(), second->guid());
+}
+
 TEST(KRDBImageStateTest, ARecordOfAnotherClassGivesAnEmptyState) {
   const auto state = KRDBImageState::initWithDBEntity(std::make_shared<dbcore::DBImage>());
   ASSERT_TRUE(state);

@@ -18,7 +18,7 @@
 namespace dbcore {
 class DBEntity;
 class DBReactor;
-}
+}  // namespace dbcore
 class KRDBEntity;
 class KRDBAbstractBaseFolder;
 class KRDBEntityFavoriteAlias;

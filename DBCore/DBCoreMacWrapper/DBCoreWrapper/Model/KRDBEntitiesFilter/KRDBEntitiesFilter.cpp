@@ -239,11 +239,13 @@ void KRDBEntitiesFilter::processChanges(const ChangesStoragePtr& changes) {
   publishChanges(added, deleted, reordered, updated, changes);
 }
 
-EntitySetPtr KRDBEntitiesFilter::processAddedEntities() { return nullptr; }
-
-EntitySetPtr KRDBEntitiesFilter::processDeleteEntities() { return nullptr; }
-
-KRDBEntitiesFilter::ProcessedUpdates KRDBEntitiesFilter::processUpdateEntities() { return {}; }
+size_t KRDBEntitiesFilter::sortedPositionOf(const EntityPtr& entity) const {
+  const auto indexed = entitiesIndexes_.find(entity.get());
+  if (indexed != entitiesIndexes_.end()) return indexed->second;
+  KRLog(KRLogLevelWarning, "Warning: inconsistence");
+  const auto found = std::find(sortedEntities_->begin(), sortedEntities_->end(), entity);
+  return static_cast<size_t>(found - sortedEntities_->begin());
+}
 
 void KRDBEntitiesFilter::publishChanges(const EntitySetPtr& added, const EntitySetPtr& deleted,
                                         const EntitySetPtr& reordered, const EntitySetPtr& updated,

@@ -122,8 +122,10 @@ class KRDBEntitiesFilter : public KRAbstractModel {
   // A new empty map keyed by entity identifiers of any type.
   static std::shared_ptr<KRDBEntityIDMapTable> emptyEntitiesChangesMapTable();
 
-  // Apply the pending changes to the lists and answer what changed; absent while nothing can be applied.
-  // The base applies nothing and keeps the pending sets.
+  // Apply the pending changes to the set, the sorted array and the index (KRDBEntitiesFilterChanges.cpp)
+  // and answer what changed; absent while no set is obtained, the pending sets then being kept. The
+  // updated entities are tested concurrently: four equal runs on the global concurrent queue, the
+  // remainder on the calling thread.
   virtual EntitySetPtr processAddedEntities();
   virtual EntitySetPtr processDeleteEntities();
   virtual ProcessedUpdates processUpdateEntities();
@@ -134,6 +136,28 @@ class KRDBEntitiesFilter : public KRAbstractModel {
 
  private:
   using KeyedSets = std::vector<std::pair<KRString, EntitySetPtr>>;
+  // ---- Incremental changes (KRDBEntitiesFilterChanges.cpp)
+  // The lists to change: a list handed out earlier (still held elsewhere) is copied first, so that its
+  // holders keep what they were given.
+  KRDBEntitySet& writableEntities();
+  EntityArray& writableSortedEntities();
+  // The entities in the order of the sort descriptors alone; in set order without descriptors.
+  EntityArray sortedByDescriptors(const KRDBEntitySet& entities) const;
+  // Index entries for the sorted array's positions from `first` on.
+  void indexFrom(size_t first);
+  void insertIntoSortedEntities(const EntityArray& entered);
+  // Drops the removed entities from the sorted array and their index entries, and takes the taken-out
+  // ones out of the array (keeping their entries, to be set again).
+  void removeFromSortedEntities(const KRDBEntitySet& removed, const KRDBEntitySet& takenOut);
+  std::vector<uint8_t> membershipOf(const EntityArray& candidates) const;
+  // Whether a neighbour in the sorted array now orders wrongly against the entity.
+  bool isOutOfOrder(const EntityPtr& entity) const;
+  // The entity's position in the sorted array: its index entry, or, when it has none (logged as an
+  // inconsistency), its place found by searching; the array's size when it is not there.
+  size_t sortedPositionOf(const EntityPtr& entity) const;
+  void applyUpdates(const ProcessedUpdates& outcome);
+  // Merges the sorted array (less removed and reordered entities) with the inserted and the reordered ones.
+  void mergeIntoSortedEntities(const EntityArray& inserted, const EntityArray& reordered);
 
   std::shared_ptr<KRDBEntitiesFilter> selfPointer();
   void didObtainEntities(const EntitySetPtr& obtained);

@@ -14,6 +14,7 @@
 #include "Model/KRDBCatalog/KRDBCatalog.hpp"
 #include "Model/KRDBEntity/KRDBDataStorageCreating.hpp"
 #include "Model/KRDBEntity/KRDBEntityContext.hpp"
+#include "Model/KRDBEntity/KRDBEntityObserver.hpp"
 #include "Model/KRDBFilteredEntitiesFetchRequest/KRDBFilteredEntitiesFetchRequest.hpp"
 
 class KRDBAdditionalFetchForImagesService;
@@ -30,7 +31,10 @@ class KRDBReferencedFolder;
 // entities and the callbacks run there; the cache is not locked. entityWithID and preparedEntity turn the
 // calling thread's run loop until the linked records arrived, so they are called on the main thread. Only
 // the queue of callbacks waiting for a change-processing pass is locked, as any thread may add to it.
-class KRDBContext : public KRAbstractModel, public KRDBEntityContext, public KRDBClosingEntityContext {
+class KRDBContext : public KRAbstractModel,
+                    public KRDBEntityContext,
+                    public KRDBClosingEntityContext,
+                    public KRDBEntityObserver {
  public:
   using Handler = std::function<void()>;
   using EntitiesHandler = std::function<void(KRDBEntitySet)>;
@@ -103,6 +107,34 @@ class KRDBContext : public KRAbstractModel, public KRDBEntityContext, public KRD
   // The path with one "/" appended when it does not end in one; nil stays nil.
   static KRString normilizedPath(const KRString& path);
 
+  // ---- Changes (KRDBContextChanges.cpp). Entities report to the context, one of their observers; the
+  // changes of one run-loop turn make one pass: the catalog writes the updated records, the observers
+  // (KRDBContextObserver) get one change set, and the undo manager one undo step.
+  void entityWillChange(const std::shared_ptr<KRDBEntity>& entity, const KRDictionary& info) override;
+  // Ignored for a deleted entity; otherwise the entity is updated and its change keys merged (later
+  // values win).
+  void entityDidChange(const std::shared_ptr<KRDBEntity>& entity, const KRDictionary& info) override;
+  // The entity's validation record is dropped at the end of the turn.
+  void validationRecordDidSet(const std::shared_ptr<KRDBEntity>& entity) override;
+  // Schedules one pass on the next turn of the main run loop unless one is scheduled.
+  void shouldProcessChanges();
+  // The pass: added, deleted and updated entities as one change set; again at once for changes the
+  // observers made meanwhile.
+  void processChanges();
+  void shouldResetValidationRecords();
+  // Setting the same manager again does nothing; another one first closes the group of the old.
+  void setUndoManager(std::shared_ptr<KRUndoManager> undoManager);
+  // Opening begins an undo group; closing ends it only when there is something to undo.
+  void setContextUndoGrouping(bool grouping);
+  // Gives the live entity of the snapshot the snapshot's record back.
+  void processUndo(const std::shared_ptr<KRDBEntity>& snapshot);
+  // Marks each entity to delete; nothing else.
+  void markToRemoveEntities(const KRDBEntitySet& entities);
+  // Moves entities into the deleted state: out of the added and updated ones, their change records, the
+  // cache and the context's reach. The callers schedule the pass.
+  void prepareDeleteEntity(const std::shared_ptr<KRDBEntity>& entity);
+  void prepareDeletedEntities(const KRDBEntitySet& entities);
+
   // ---- Relations (KRDBContextRelations.cpp): the catalog's answers as cached, prepared instances
   std::shared_ptr<KRDBEntityFavoriteAlias> favoriteAliasForEntity(
       const std::shared_ptr<KRDBEntity>& entity) override;
@@ -174,6 +206,11 @@ class KRDBContext : public KRAbstractModel, public KRDBEntityContext, public KRD
   std::shared_ptr<T> prepared(const std::shared_ptr<T>& entity);
   KRDBEntitySet preparedSet(const KRDBEntitySet& entities);
   [[noreturn]] void raiseGraphChangeUnavailable(const char* operation) const;
+  void mergeChangeRecord(const KRDBEntityIDPtr& entityID, const KRDictionary& info);
+  // The block of a scheduled pass: the pass, the waiting callbacks, then the flag and the undo group.
+  void runScheduledPass();
+  void resetValidationRecords();
+  void detachDeletedEntity(const std::shared_ptr<KRDBEntity>& entity);
 
   bool waitingForProcessChanges_ = false;
   bool waitingForClose_ = false;

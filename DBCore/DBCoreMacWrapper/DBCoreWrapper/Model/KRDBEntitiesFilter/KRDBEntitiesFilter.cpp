@@ -304,6 +304,37 @@ std::shared_ptr<KRDBEntityIDMapTable> KRDBEntitiesFilter::emptyEntitiesChangesMa
   return factory->makeMapTableWithObjectsMappedByEntityIDs();
 }
 
+void KRDBEntitiesFilter::obtainAdmittedEntitiesOf(const std::shared_ptr<KRDBEntitiesFilter>& source,
+                                                  EntitiesHandler completion) {
+  if (!source) return completion(std::make_shared<KRDBEntitySet>());
+  const std::weak_ptr<KRObject> weakSelf = weak_from_this();
+  source->obtainEntities([weakSelf, completion = std::move(completion)](const EntitySetPtr& offered) {
+    const auto self = std::static_pointer_cast<KRDBEntitiesFilter>(weakSelf.lock());
+    if (!self) return;
+    auto admitted = std::make_shared<KRDBEntitySet>();
+    if (offered) {
+      for (const auto& entity : *offered) {
+        if (self->isEntitySatisfiesFilterConditions(entity)) admitted->insert(entity);
+      }
+    }
+    completion(admitted);
+  });
+}
+
+KRDBEntitiesFilter::EntitySetPtr KRDBEntitiesFilter::entitiesOfInfo(const KRDictionary& info,
+                                                                    const KRString& key) {
+  return KRDBValueBox<KRDBEntitySet>::heldBy(info.objectForKey(KRValue(key)));
+}
+
+KRDBEntitiesFilter::ChangesStoragePtr KRDBEntitiesFilter::changesOfInfo(const KRDictionary& info) {
+  return KRDBEntitiesChangesStorage::initWithAddedEntities(
+      entitiesOfInfo(info, KRDBEntitiesFilterAddedEntities),
+      entitiesOfInfo(info, KRDBEntitiesFilterDeletedEntities),
+      entitiesOfInfo(info, KRDBEntitiesFilterUpdatedEntities),
+      KRDBValueBox<KRDBEntityIDMapTable>::heldBy(
+          info.objectForKey(KRValue(KRDBEntitiesFilterEntitiesChanges))));
+}
+
 std::shared_ptr<KRDBEntitiesFilter> KRDBEntitiesFilter::selfPointer() {
   return std::static_pointer_cast<KRDBEntitiesFilter>(shared_from_this());
 }

@@ -104,6 +104,7 @@ class KRDBEntitiesFilter : public KRAbstractModel {
   };
 
   KRDBEntitiesFilter();
+  std::shared_ptr<KRDBEntitiesFilter> selfPointer();
 
   // Replace a list; the same object again changes nothing. The one-argument forms notify.
   void setEntities(EntitySetPtr entities, bool notify);
@@ -121,6 +122,15 @@ class KRDBEntitiesFilter : public KRAbstractModel {
   KRComparisonResult compareEntity(const EntityPtr& entity, const EntityPtr& otherEntity) const;
   // A new empty map keyed by entity identifiers of any type.
   static std::shared_ptr<KRDBEntityIDMapTable> emptyEntitiesChangesMapTable();
+  // The entity set under the key of a change notification's info, or absent.
+  static EntitySetPtr entitiesOfInfo(const KRDictionary& info, const KRString& key);
+  // Obtains the source filter's entities and gives the completion those this filter's test admits (an
+  // empty set without a source). The completion holds this filter weakly.
+  void obtainAdmittedEntitiesOf(const std::shared_ptr<KRDBEntitiesFilter>& source,
+                                EntitiesHandler completion);
+  // The change set a filter's change notification describes: its added, deleted and updated entities and
+  // their change records, as they are.
+  static ChangesStoragePtr changesOfInfo(const KRDictionary& info);
 
   // Apply the pending changes to the set, the sorted array and the index (KRDBEntitiesFilterChanges.cpp)
   // and answer what changed; absent while no set is obtained, the pending sets then being kept. The
@@ -159,7 +169,6 @@ class KRDBEntitiesFilter : public KRAbstractModel {
   // Merges the sorted array (less removed and reordered entities) with the inserted and the reordered ones.
   void mergeIntoSortedEntities(const EntityArray& inserted, const EntityArray& reordered);
 
-  std::shared_ptr<KRDBEntitiesFilter> selfPointer();
   void didObtainEntities(const EntitySetPtr& obtained);
   void sortObtainedEntities(const EntitySetPtr& obtained);
   EntityArrayPtr sortedArrayOf(const KRDBEntitySet& entities) const;

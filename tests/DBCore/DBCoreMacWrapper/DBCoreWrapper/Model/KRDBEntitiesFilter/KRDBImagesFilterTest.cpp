@@ -4,7 +4,7 @@
 
 #include <memory>
 
-#include "../KRDBContext/KRContextCatalog.hpp"
+#include "KRContextCatalog.hpp"
 #include "Model/KRDBEntitiesFilter/KRDBEntitiesChangesStorage.hpp"
 #include "Model/KRDBFilteredImagesFetchRequest/KRDBFilteredImagesFetchRequest.hpp"
 #include "Model/KRDBImageAttributes/KRDBImageAttributes.hpp"

@@ -4,7 +4,7 @@
 
 #include <memory>
 
-#include "../KRDBContext/KRContextCatalog.hpp"
+#include "KRContextCatalog.hpp"
 #include "KRFoundation/KRException.hpp"
 #include "KRServices/KRCapturingLogSink.hpp"
 #include "Model/KRDBEntitiesFilter/KRDBEntitiesChangesStorage.hpp"

@@ -179,10 +179,11 @@ class KRDBCatalog : public KRAbstractModel {
   void fetchParentOfFilter(const std::shared_ptr<KRDBEntity>& filter, ResultHandler<FolderPtr> handler,
                            bool sync);
   FolderPtr fetchParentOfFilter(const std::shared_ptr<KRDBEntity>& filter);
-  // Moves the given folders that are not children yet under a collection or referenced folder, in one commit.
-  void addChildsSync(const KRDBEntitySet& childs, const std::shared_ptr<KRDBEntity>& filter);
-  void addChilds(const KRDBEntitySet& childs, const std::shared_ptr<KRDBEntity>& filter, Handler handler,
-                 bool sync);
+  // Moves the given folders that are not children yet under a collection or referenced folder, in one commit;
+  // answers the folders moved.
+  KRDBEntitySet addChildsSync(const KRDBEntitySet& childs, const std::shared_ptr<KRDBEntity>& filter);
+  void addChilds(const KRDBEntitySet& childs, const std::shared_ptr<KRDBEntity>& filter,
+                 ResultHandler<KRDBEntitySet> handler, bool sync);
 
   // The images of a collection, referenced folder (at or under its path) or smart filter (its conditions),
   // not marked to delete, by id.
@@ -190,14 +191,15 @@ class KRDBCatalog : public KRAbstractModel {
   void fetchImagesOfFilter(const std::shared_ptr<KRDBEntity>& filter, ResultHandler<KRDBEntityArray> handler,
                            bool sync);
   KRDBEntityArray fetchImagesOfFilter(const std::shared_ptr<KRDBEntity>& filter);
-  // Adds the images not yet members to a collection or referenced folder, in one commit.
-  void addImagesSync(const KRDBEntitySet& images, const std::shared_ptr<KRDBEntity>& filter);
-  void addImages(const KRDBEntitySet& images, const std::shared_ptr<KRDBEntity>& filter, Handler handler,
-                 bool sync);
-  // Removes the images that are members from a collection, in one commit.
-  void deleteImagesSync(const KRDBEntitySet& images, const std::shared_ptr<KRDBEntity>& filter);
-  void deleteImages(const KRDBEntitySet& images, const std::shared_ptr<KRDBEntity>& filter, Handler handler,
-                    bool sync);
+  // Adds the images not yet members to a collection or referenced folder, in one commit; answers the images
+  // added.
+  KRDBEntitySet addImagesSync(const KRDBEntitySet& images, const std::shared_ptr<KRDBEntity>& filter);
+  void addImages(const KRDBEntitySet& images, const std::shared_ptr<KRDBEntity>& filter,
+                 ResultHandler<KRDBEntitySet> handler, bool sync);
+  // Removes the images that are members from a collection, in one commit; answers the images removed.
+  KRDBEntitySet deleteImagesSync(const KRDBEntitySet& images, const std::shared_ptr<KRDBEntity>& filter);
+  void deleteImages(const KRDBEntitySet& images, const std::shared_ptr<KRDBEntity>& filter,
+                    ResultHandler<KRDBEntitySet> handler, bool sync);
   // The collections that hold the image.
   KRDBEntitySet fetchFiltersOfImageSync(const std::shared_ptr<KRDBImage>& image);
   void fetchFiltersOfImage(const std::shared_ptr<KRDBImage>& image, ResultHandler<KRDBEntitySet> handler,

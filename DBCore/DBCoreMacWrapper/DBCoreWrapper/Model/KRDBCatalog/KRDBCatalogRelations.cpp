@@ -239,30 +239,33 @@ FolderPtr KRDBCatalog::fetchParentOfFilter(const std::shared_ptr<KRDBEntity>& fi
   return waitFor<FolderPtr>([&](auto handler) { fetchParentOfFilter(filter, handler, true); });
 }
 
-void KRDBCatalog::addChildsSync(const KRDBEntitySet& childs, const std::shared_ptr<KRDBEntity>& filter) {
+KRDBEntitySet KRDBCatalog::addChildsSync(const KRDBEntitySet& childs,
+                                         const std::shared_ptr<KRDBEntity>& filter) {
   const KRDBEntitySet moving = missingFrom(childs, fetchChildsOfFilterSync(filter));
   switch (entityTypeOf(filter)) {
     case KRDBEntityTypeCollection:
-      return writeEach<std::shared_ptr<DBFilter>>(
+      writeEach<std::shared_ptr<DBFilter>>(
           *this, recordsOf<DBFilter>(moving), kMoveFilterOperation,
           [target = recordOf<DBFilter>(filter)](const Reactor& reactor, const auto& child) {
             reactor->Move(child, target);
           });
+      return moving;
     case KRDBEntityTypeReferencedFolder:
-      return writeEach<std::shared_ptr<DBRefFolder>>(
+      writeEach<std::shared_ptr<DBRefFolder>>(
           *this, recordsOf<DBRefFolder>(moving), kMoveRefFolderOperation,
           [target = recordOf<DBRefFolder>(filter)](const Reactor& reactor, const auto& child) {
             reactor->Move(child, target);
           });
+      return moving;
     default:
-      return;
+      return {};
   }
 }
 
 void KRDBCatalog::addChilds(const KRDBEntitySet& childs, const std::shared_ptr<KRDBEntity>& filter,
-                            Handler handler, bool sync) {
-  performWork(
-      *this, [childs, filter](KRDBCatalog& catalog) { catalog.addChildsSync(childs, filter); },
+                            ResultHandler<KRDBEntitySet> handler, bool sync) {
+  performOperation<KRDBEntitySet>(
+      [childs, filter](KRDBCatalog& catalog) { return catalog.addChildsSync(childs, filter); },
       std::move(handler), sync);
 }
 
@@ -303,11 +306,13 @@ KRDBEntityArray KRDBCatalog::fetchImagesOfFilter(const std::shared_ptr<KRDBEntit
   return waitFor<KRDBEntityArray>([&](auto handler) { fetchImagesOfFilter(filter, handler, true); });
 }
 
-void KRDBCatalog::addImagesSync(const KRDBEntitySet& images, const std::shared_ptr<KRDBEntity>& filter) {
+KRDBEntitySet KRDBCatalog::addImagesSync(const KRDBEntitySet& images,
+                                         const std::shared_ptr<KRDBEntity>& filter) {
   const int64_t type = entityTypeOf(filter);
-  if (type != KRDBEntityTypeCollection && type != KRDBEntityTypeReferencedFolder) return;
+  if (type != KRDBEntityTypeCollection && type != KRDBEntityTypeReferencedFolder) return {};
   const KRDBEntityArray members = fetchImagesOfFilterSync(filter);
-  const auto adding = recordsOf<DBImage>(missingFrom(images, KRDBEntitySet(members.begin(), members.end())));
+  const KRDBEntitySet added = missingFrom(images, KRDBEntitySet(members.begin(), members.end()));
+  const auto adding = recordsOf<DBImage>(added);
   if (type == KRDBEntityTypeCollection) {
     writeEach<std::shared_ptr<DBImage>>(
         *this, adding, kFilterAddImageOperation,
@@ -321,17 +326,19 @@ void KRDBCatalog::addImagesSync(const KRDBEntitySet& images, const std::shared_p
           reactor->Bind(folder, image);
         });
   }
+  return added;
 }
 
 void KRDBCatalog::addImages(const KRDBEntitySet& images, const std::shared_ptr<KRDBEntity>& filter,
-                            Handler handler, bool sync) {
-  performWork(
-      *this, [images, filter](KRDBCatalog& catalog) { catalog.addImagesSync(images, filter); },
+                            ResultHandler<KRDBEntitySet> handler, bool sync) {
+  performOperation<KRDBEntitySet>(
+      [images, filter](KRDBCatalog& catalog) { return catalog.addImagesSync(images, filter); },
       std::move(handler), sync);
 }
 
-void KRDBCatalog::deleteImagesSync(const KRDBEntitySet& images, const std::shared_ptr<KRDBEntity>& filter) {
-  if (entityTypeOf(filter) != KRDBEntityTypeCollection) return;
+KRDBEntitySet KRDBCatalog::deleteImagesSync(const KRDBEntitySet& images,
+                                            const std::shared_ptr<KRDBEntity>& filter) {
+  if (entityTypeOf(filter) != KRDBEntityTypeCollection) return {};
   const KRDBEntityArray members = fetchImagesOfFilterSync(filter);
   const KRDBEntitySet outside = missingFrom(images, KRDBEntitySet(members.begin(), members.end()));
   KRDBEntitySet removing;
@@ -343,12 +350,13 @@ void KRDBCatalog::deleteImagesSync(const KRDBEntitySet& images, const std::share
       [filterID = filter->entityID()->dbid()](const Reactor& reactor, const auto& image) {
         reactor->FilterDelImage(filterID, image);
       });
+  return removing;
 }
 
 void KRDBCatalog::deleteImages(const KRDBEntitySet& images, const std::shared_ptr<KRDBEntity>& filter,
-                               Handler handler, bool sync) {
-  performWork(
-      *this, [images, filter](KRDBCatalog& catalog) { catalog.deleteImagesSync(images, filter); },
+                               ResultHandler<KRDBEntitySet> handler, bool sync) {
+  performOperation<KRDBEntitySet>(
+      [images, filter](KRDBCatalog& catalog) { return catalog.deleteImagesSync(images, filter); },
       std::move(handler), sync);
 }
 

@@ -4,6 +4,7 @@
 #include <functional>
 #include <memory>
 #include <mutex>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -135,6 +136,44 @@ class KRDBContext : public KRAbstractModel,
   void prepareDeleteEntity(const std::shared_ptr<KRDBEntity>& entity);
   void prepareDeletedEntities(const KRDBEntitySet& entities);
 
+  // ---- Creation and deletion (KRDBContextGraph.cpp)
+  using EntityHandler = std::function<void(std::shared_ptr<KRDBEntity>)>;
+  using ArrayHandler = std::function<void(const KRDBEntityArray&)>;
+  // The last entity the catalog created, at once (the catalog's queue is waited for).
+  std::shared_ptr<KRDBEntity> createEntityWithType(int64_t entityType);
+  std::shared_ptr<KRDBEntity> createEntityWithType(int64_t entityType, const KRDictionary& additionalInfo);
+  // The same, delivered on the main thread.
+  void createEntityWithType(int64_t entityType, EntityHandler handler);
+  void createEntityWithType(int64_t entityType, const KRDictionary& additionalInfo, EntityHandler handler);
+  void createEntitiesWithType(int64_t entityType, const std::vector<KRDictionary>& entitiesInfo,
+                              ArrayHandler handler);
+  // One entity per info, or one without info when there is no array; each created entity is processed
+  // with its own info (or the first, when the counts differ) and its deletion registered for undo.
+  void createEntitiesWithType(int64_t entityType,
+                              const std::optional<std::vector<KRDictionary>>& entitiesInfo,
+                              ArrayHandler handler, bool sync);
+  // Takes a created entity into the graph: prepared, added, placed under its parent; schedules a pass.
+  void processCreateEntity(const std::shared_ptr<KRDBEntity>& entity, const KRDictionary& additionalInfo);
+  // The info's parent for a referenced folder; the import index and date for an image.
+  void applyInfo(const KRDictionary& info, const std::shared_ptr<KRDBEntity>& entity);
+  // A referenced folder takes its unused images and its subfolders with it; then deleteEntityPrimitive.
+  void deleteEntity(const std::shared_ptr<KRDBEntity>& entity);
+  void deleteEntities(const KRDBEntitySet& entities);
+  void deleteEntitiesPrimitives(const KRDBEntitySet& entities);
+  // The steps of the entity's type, then (unless it is marked to delete) the deleted state, the catalog's
+  // deletion and a pass. Paths and volumes are never deleted here.
+  void deleteEntityPrimitive(const std::shared_ptr<KRDBEntity>& entity);
+  // The image's attribute records leave with it, and its collections drop it.
+  void deleteImage(const std::shared_ptr<KRDBImage>& image);
+  // deleteImage, the deleted state and a pass for each image, then one catalog deletion of them all.
+  void deleteImages(const KRDBEntitySet& images);
+  // Marks the collection, its favorite alias and all its descendants to delete; writes nothing.
+  void deleteFilter(const std::shared_ptr<KRDBCollection>& collection);
+  // Deletes the folder's favorite alias and takes it out of its parent's children.
+  void deleteReffolder(const std::shared_ptr<KRDBReferencedFolder>& folder);
+  // Every folder below the folder, not the folder itself.
+  static KRDBEntitySet recursiveSubfolders(const std::shared_ptr<KRDBAbstractBaseFolder>& folder);
+
   // ---- Relations (KRDBContextRelations.cpp): the catalog's answers as cached, prepared instances
   std::shared_ptr<KRDBEntityFavoriteAlias> favoriteAliasForEntity(
       const std::shared_ptr<KRDBEntity>& entity) override;
@@ -162,8 +201,9 @@ class KRDBContext : public KRAbstractModel,
                                     std::function<void(KRDBCatalog::ImageStatesByID)> handler);
   std::shared_ptr<KRDBVolume> volumeForPath(const std::shared_ptr<KRDBPath>& path) override;
 
-  // ---- Graph changes (KRDBContextRelations.cpp). They come with change processing and undo; until then
-  // each logs an error and raises the unrecognised-operation exception.
+  // ---- Relation changes (KRDBContextMembership.cpp). Memory first, then the catalog, whose answer is
+  // compared with memory (a mismatch is logged); each registers its inverse for undo, except adding images
+  // to a referenced folder.
   void addChilds(const KRDBEntitySet& childs, const std::shared_ptr<KRDBAbstractBaseFolder>& filter) override;
   void addImages(const KRDBEntitySet& images, const std::shared_ptr<KRDBAbstractBaseFolder>& filter) override;
   void addImages(const KRDBEntitySet& images, const std::shared_ptr<KRDBReferencedFolder>& folder) override;
@@ -173,6 +213,17 @@ class KRDBContext : public KRAbstractModel,
                  const std::shared_ptr<KRDBImage>& image) override;
   void setCurrentState(const std::shared_ptr<KRDBImageState>& state,
                        const std::shared_ptr<KRDBImage>& image) override;
+  // Parallel arrays: each image gets its states and current state, in one catalog write.
+  void setStatesArray(const std::vector<KRDBImageStates>& statesArray,
+                      const KRDBImageStates& currentStatesArray, const KRDBEntityArray& imagesArray);
+  // The catalog's write, then the path's tracked setter.
+  void setVolume(const std::shared_ptr<KRDBVolume>& volume, const std::shared_ptr<KRDBPath>& path);
+  // Moves the images that are not in the folder yet into it: rebinding those that had a folder, binding the
+  // others.
+  void setFolderDBPath(const std::shared_ptr<KRDBPath>& path, const KRDBEntityArray& images);
+  // Renames the folder in the catalog; on success the cached paths at and under it follow in memory.
+  void setNewPath(const KRString& newPath, const std::shared_ptr<KRDBVolume>& newVolume,
+                  const std::shared_ptr<KRDBPath>& path, std::function<void(bool)> completion);
 
  private:
   explicit KRDBContext(std::shared_ptr<KRDBCatalog> catalog);
@@ -205,12 +256,28 @@ class KRDBContext : public KRAbstractModel,
   template <class T>
   std::shared_ptr<T> prepared(const std::shared_ptr<T>& entity);
   KRDBEntitySet preparedSet(const KRDBEntitySet& entities);
-  [[noreturn]] void raiseGraphChangeUnavailable(const char* operation) const;
   void mergeChangeRecord(const KRDBEntityIDPtr& entityID, const KRDictionary& info);
   // The block of a scheduled pass: the pass, the waiting callbacks, then the flag and the undo group.
   void runScheduledPass();
   void resetValidationRecords();
   void detachDeletedEntity(const std::shared_ptr<KRDBEntity>& entity);
+  static std::optional<std::vector<KRDictionary>> infosOf(const KRDictionary& info);
+  // The catalog's creation: one entity per info, or one without info when there is no array.
+  void createInCatalog(int64_t entityType, const std::optional<std::vector<KRDictionary>>& infos,
+                       ArrayHandler handler, bool sync);
+  void takeCreatedEntities(int64_t entityType, const KRDBEntityArray& entities,
+                           const std::optional<std::vector<KRDictionary>>& infos);
+  void attachCreatedReferencedFolder(const std::shared_ptr<KRDBReferencedFolder>& folder,
+                                     const KRDictionary& info);
+  void deleteReferencedFolderContents(const std::shared_ptr<KRDBReferencedFolder>& folder);
+  void renameCachedPaths(const KRString& oldPath, const std::shared_ptr<KRDBVolume>& oldVolume,
+                         const KRString& newPath, const std::shared_ptr<KRDBVolume>& newVolume);
+  // Registers the action, called with this context, as the undo step of what follows; nothing without an
+  // undo manager.
+  template <class Action>
+  void registerUndo(Action action) {
+    if (undoManager_) undoManager_->prepareWithInvocationTarget<KRDBContext>(selfPtr(), std::move(action));
+  }
 
   bool waitingForProcessChanges_ = false;
   bool waitingForClose_ = false;

@@ -147,51 +147,13 @@ void KRDBContext::obtainCurrentStatesForImages(const KRDBEntityArray& images,
 std::shared_ptr<KRDBEntityFavoriteAlias> KRDBContext::favoriteAliasForEntity(
     const std::shared_ptr<KRDBEntity>& entity) {
   bool created = false;
-  const auto alias = prepared(catalog_->fetchFavoriteAliasForEntity(entity, &created));
-  // A new alias is an added entity of the next change-processing pass.
-  if (alias && created) addedEntities_.insert(alias);
+  const auto alias = catalog_->fetchFavoriteAliasForEntity(entity, &created);
+  if (!alias || !created) return prepared(alias);
+  // A new alias is a created entity of the next change-processing pass.
+  processCreateEntity(alias, KRDictionary());
   return alias;
 }
 
 std::shared_ptr<KRDBVolume> KRDBContext::volumeForPath(const std::shared_ptr<KRDBPath>& path) {
   return prepared(catalog_->fetchVolumeForPath(path));
-}
-
-// ---- Graph changes
-
-void KRDBContext::raiseGraphChangeUnavailable(const char* operation) const {
-  KRLog(KRLogLevelError, "Error: %@ is not available before change processing", operation);
-  KRException::raise(KRException::NSInvalidArgumentException,
-                     "-[" + className() + " " + operation + "]: unrecognized selector");
-}
-
-void KRDBContext::addChilds(const KRDBEntitySet& /*childs*/,
-                            const std::shared_ptr<KRDBAbstractBaseFolder>& /*filter*/) {
-  raiseGraphChangeUnavailable("addChilds:toFilter:");
-}
-
-void KRDBContext::addImages(const KRDBEntitySet& /*images*/,
-                            const std::shared_ptr<KRDBAbstractBaseFolder>& /*filter*/) {
-  raiseGraphChangeUnavailable("addImages:toFilter:");
-}
-
-void KRDBContext::addImages(const KRDBEntitySet& /*images*/,
-                            const std::shared_ptr<KRDBReferencedFolder>& /*folder*/) {
-  raiseGraphChangeUnavailable("addImages:toReferencedFolder:");
-}
-
-void KRDBContext::deleteImages(const KRDBEntitySet& /*images*/,
-                               const std::shared_ptr<KRDBAbstractBaseFolder>& /*filter*/) {
-  raiseGraphChangeUnavailable("deleteImages:fromFilter:");
-}
-
-void KRDBContext::setStates(const KRDBImageStates& /*states*/,
-                            const std::shared_ptr<KRDBImageState>& /*currentState*/,
-                            const std::shared_ptr<KRDBImage>& /*image*/) {
-  raiseGraphChangeUnavailable("setStates:currentState:forImage:");
-}
-
-void KRDBContext::setCurrentState(const std::shared_ptr<KRDBImageState>& /*state*/,
-                                  const std::shared_ptr<KRDBImage>& /*image*/) {
-  raiseGraphChangeUnavailable("setCurrentState:forImage:");
 }

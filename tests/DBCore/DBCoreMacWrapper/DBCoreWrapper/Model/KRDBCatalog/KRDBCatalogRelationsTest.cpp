@@ -497,13 +497,13 @@ struct HandledCalls {
     catalog.fetchParentOfFilter(
         filter, [this](KRDBCatalog::FolderPtr) { note(); }, sync);
     catalog.addChilds(
-        {}, filter, [this] { note(); }, sync);
+        {}, filter, [this](KRDBEntitySet) { note(); }, sync);
     catalog.fetchImagesOfFilter(
         filter, [this](KRDBEntityArray) { note(); }, sync);
     catalog.addImages(
-        {image}, filter, [this] { note(); }, sync);
+        {image}, filter, [this](KRDBEntitySet) { note(); }, sync);
     catalog.deleteImages(
-        {image}, filter, [this] { note(); }, sync);
+        {image}, filter, [this](KRDBEntitySet) { note(); }, sync);
     catalog.fetchFiltersOfImage(
         image, [this](KRDBEntitySet) { note(); }, sync);
     catalog.fetchStatesOfImage(

@@ -5,8 +5,6 @@
 #include <vector>
 
 #include "KRContextCatalog.hpp"
-#include "KRFoundation/KRException.hpp"
-#include "KRServices/KRCapturingLogSink.hpp"
 #include "Model/KRDBCollection/KRDBCollection.hpp"
 #include "Model/KRDBContext/KRDBContext.hpp"
 #include "Model/KRDBEntitiesFilter/KRDBEntitiesStorage.hpp"
@@ -170,26 +168,6 @@ TEST_F(KRDBContextRelationsTest, ANewFavoriteAliasIsAnAddedEntity) {
   context->addedEntities().clear();
   EXPECT_EQ(context->favoriteAliasForEntity(collection), alias);
   EXPECT_TRUE(context->addedEntities().empty());
-}
-
-TEST_F(KRDBContextRelationsTest, GraphChangesAreRefusedUntilChangeProcessingExists) {
-  const auto image = cached(written[0]);
-  const auto collection = cached(first);
-  const std::vector<std::pair<std::string, std::function<void()>>> changes = {
-      {"addChilds:toFilter:", [&] { context->addChilds({cached(second)}, collection); }},
-      {"addImages:toFilter:",
-       [&] { context->addImages({image}, std::static_pointer_cast<KRDBAbstractBaseFolder>(collection)); }},
-      {"addImages:toReferencedFolder:", [&] { context->addImages({image}, cached(folder)); }},
-      {"deleteImages:fromFilter:", [&] { context->deleteImages({image}, collection); }},
-      {"setStates:currentState:forImage:", [&] { context->setStates({}, nullptr, image); }},
-      {"setCurrentState:forImage:", [&] { context->setCurrentState(nullptr, image); }},
-  };
-  for (const auto& [operation, change] : changes) {
-    KRCapturingLogSink sink;
-    EXPECT_THROW(change(), KRException) << operation;
-    ASSERT_EQ(sink.messages().size(), 1u) << operation;
-    EXPECT_EQ(sink.messages()[0], "Error: " + operation + " is not available before change processing");
-  }
 }
 
 }  // namespace

@@ -153,8 +153,11 @@ class KRDBEntitiesFilter : public KRAbstractModel {
   EntityArray& writableSortedEntities();
   // The entities in the order of the sort descriptors alone; in set order without descriptors.
   EntityArray sortedByDescriptors(const KRDBEntitySet& entities) const;
-  // Index entries for the sorted array's positions from `first` on.
+  // Index entries for the sorted array's positions from `first` on, or in [first, last).
   void indexFrom(size_t first);
+  void indexRange(size_t first, size_t last);
+  // The one reordered entity of a pass that adds and removes nothing, moved to its place in the array.
+  void moveReorderedEntity(const EntityPtr& entity);
   void insertIntoSortedEntities(const EntityArray& entered);
   // Drops the removed entities from the sorted array and their index entries, and takes the taken-out
   // ones out of the array (keeping their entries, to be set again).

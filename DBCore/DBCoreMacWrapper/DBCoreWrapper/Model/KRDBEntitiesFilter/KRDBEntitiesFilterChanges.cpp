@@ -1,5 +1,6 @@
 // The incremental side of KRDBEntitiesFilter: applying the pending added, deleted and updated entities to
 // the set, the sorted array and the index without sorting the whole array again.
+#include <algorithm>
 #include <cstdint>
 #include <vector>
 
@@ -38,11 +39,7 @@ KRDBEntitiesFilter::EntityArray KRDBEntitiesFilter::sortedByDescriptors(const KR
   return KRSortDescriptor::sortedArrayUsingDescriptors(array, *sortDescriptors_);
 }
 
-void KRDBEntitiesFilter::indexFrom(size_t first) {
-  const EntityArray& array = *sortedEntities_;
-  for (size_t position = first; position < array.size(); ++position)
-    entitiesIndexes_[array[position].get()] = position;
-}
+void KRDBEntitiesFilter::indexFrom(size_t first) { indexRange(first, sortedEntities_->size()); }
 
 // ---- Added
 
@@ -181,6 +178,10 @@ void KRDBEntitiesFilter::applyUpdates(const ProcessedUpdates& outcome) {
     for (const auto& entity : removed) entities.erase(entity);
   }
   if ((inserted.empty() && removed.empty() && reordered.empty()) || !sortedEntities_) return;
+  // One moved entity in an array whose index is whole: only the entities it passes move.
+  if (inserted.empty() && removed.empty() && reordered.size() == 1 && !sortingDisabled_ &&
+      entitiesIndexes_.size() == sortedEntities_->size())
+    return moveReorderedEntity(*reordered.begin());
   removeFromSortedEntities(removed, reordered);
   const EntityArray sortedInserted = sortedByDescriptors(inserted);
   if (sortingDisabled_) {
@@ -190,6 +191,34 @@ void KRDBEntitiesFilter::applyUpdates(const ProcessedUpdates& outcome) {
     mergeIntoSortedEntities(sortedInserted, sortedByDescriptors(reordered));
   }
   indexFrom(0);
+}
+
+void KRDBEntitiesFilter::moveReorderedEntity(const EntityPtr& entity) {
+  EntityArray& array = writableSortedEntities();
+  const size_t from = sortedPositionOf(entity);
+  if (from >= array.size()) return;
+  // The merge of the array less the entity with the entity alone puts it before the first other entity
+  // ordered strictly after it; the rest of the array is sorted, so that place is found by bisection, on
+  // the side it moved to, and only the entities between its old and new places change position.
+  const auto notAfter = [this, &entity](const EntityPtr& other) {
+    return compareEntity(entity, other) != KROrderedAscending;
+  };
+  const auto begin = array.begin();
+  const auto at = begin + static_cast<std::ptrdiff_t>(from);
+  const auto right = std::partition_point(at + 1, array.end(), notAfter);
+  if (right != at + 1) {
+    std::rotate(at, at + 1, right);
+    return indexRange(from, static_cast<size_t>(right - begin));
+  }
+  const auto left = std::partition_point(begin, at, notAfter);
+  std::rotate(left, at, at + 1);
+  indexRange(static_cast<size_t>(left - begin), from + 1);
+}
+
+void KRDBEntitiesFilter::indexRange(size_t first, size_t last) {
+  const EntityArray& array = *sortedEntities_;
+  for (size_t position = first; position < last; ++position)
+    entitiesIndexes_[array[position].get()] = position;
 }
 
 void KRDBEntitiesFilter::mergeIntoSortedEntities(const EntityArray& inserted, const EntityArray& reordered) {

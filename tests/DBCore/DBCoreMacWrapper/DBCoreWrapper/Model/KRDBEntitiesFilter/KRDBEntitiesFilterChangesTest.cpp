@@ -173,6 +173,21 @@ TEST_F(KRDBEntitiesFilterChangesTest, AnEntityMovedToATieWithAnotherGoesAfterIt)
   EXPECT_EQ(order(), (std::vector<int64_t>{2, 3, 1}));
 }
 
+TEST_F(KRDBEntitiesFilterChangesTest, AnEntityMovedForwardPassesOnlyTheEntitiesBetween) {
+  rank(4, 40);
+  rank(5, 50);
+  filter->obtainSortedEntities(nullptr);
+  filter->pending.front()(setOf({1, 2, 3, 4, 5}));
+  filter->addListener(observer);
+  rank(4, 15);
+  process(nullptr, nullptr, setOf({4}));
+  EXPECT_EQ(order(), (std::vector<int64_t>{1, 4, 2, 3, 5}));
+  rank(1, 30);
+  process(nullptr, nullptr, setOf({1}));
+  EXPECT_EQ(order(), (std::vector<int64_t>{4, 2, 3, 1, 5}));
+  EXPECT_EQ(*published(0, KRDBEntitiesFilterReorderedEntities), *setOf({4}));
+}
+
 TEST_F(KRDBEntitiesFilterChangesTest, AnEntityTiedWithItsNeighbourIsNotReordered) {
   obtainFirstThree();
   rank(1, 20);

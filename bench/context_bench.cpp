@@ -10,13 +10,12 @@
 #include <algorithm>
 #include <cstdio>
 #include <cstdlib>
-#include <filesystem>
 #include <fstream>
-#include <map>
 #include <string>
 #include <unordered_map>
 #include <vector>
 
+#include "KRBenchCatalog.hpp"
 #include "KRBenchRecords.hpp"
 #include "KRBenchSqlite.hpp"
 #include "KRFoundation/KRDate.hpp"
@@ -28,14 +27,7 @@
 #include "Model/KRDBEntity/KRDBEntityID.hpp"
 #include "Model/KRDBEntity/KRDBEntityType.hpp"
 #include "Model/KRDBImage/KRDBImage.hpp"
-#include "dbexivimgattrib.hpp"
-#include "dbimage.hpp"
-#include "dbimghistorystate.hpp"
-#include "dbpath.hpp"
-#include "dbreactor.hpp"
 #include "dbstrings.hpp"
-#include "dbuserimgattrib.hpp"
-#include "dbvolume.hpp"
 #include "support/KRTemporaryDirectory.hpp"
 
 namespace {
@@ -53,103 +45,6 @@ void require(bool holds, const char* what) {
   if (holds) return;
   std::fprintf(stderr, "check failed: %s\n", what);
   std::abort();
-}
-
-// ---- The catalog
-
-using KRBenchRecords::records;
-
-// Two volumes, the folders alternating between them.
-std::vector<std::shared_ptr<dbcore::DBPath>> fillFolders(dbcore::DBReactor& reactor) {
-  using namespace dbcore;
-  const auto volumes = records<DBVolume>(kVolumes, [](DBVolume& volume, int v) {
-    volume.uuid = L"VOLUME-" + std::to_wstring(v);
-    volume.info = L"{\"name\":\"Disk " + std::to_wstring(v) + L"\"}";
-  });
-  for (const auto& volume : volumes) reactor << volume;
-  const auto folders = records<DBPath>(kFolders, [&volumes](DBPath& folder, int f) {
-    folder.path = L"Photos/Folder " + std::to_wstring(f);
-    folder.volume_id = volumes[f % kVolumes]->id();
-  });
-  reactor << folders;
-  return folders;
-}
-
-std::vector<std::shared_ptr<dbcore::DBImage>> fillImages(dbcore::DBReactor& reactor) {
-  using namespace dbcore;
-  const auto images = records<DBImage>(kImages, [](DBImage& image, int i) {
-    image.guid = L"GUID-" + std::to_wstring(i);
-    image.path = L"IMG_" + std::to_wstring(i) + L".CR3";
-    image.width = 6000 + i % 7;
-    image.height = 4000 + i % 3;
-    image.file_size = 20'000'000 + i;
-    image.modification_date = 1'600'000'000 + i;
-    image.import_date = 1'650'000'000 + i;
-    image.import_index = i;
-    image.creation_date = 1'500'000'000 + i;
-  });
-  reactor << images;
-  return images;
-}
-
-void fillAttributes(dbcore::DBReactor& reactor, const std::vector<std::shared_ptr<dbcore::DBImage>>& images) {
-  using namespace dbcore;
-  reactor << records<DBUserImgAttrib>(kImages, [&images](DBUserImgAttrib& attributes, int i) {
-    attributes.image_id = images[i]->id();
-    attributes.rating = i % 6;
-    attributes.color = i % 4;
-    attributes.marker = i % 3;
-    attributes.edit_date = 1'660'000'000 + i;
-  });
-  reactor << records<DBExivImgAttrib>(kImages, [&images](DBExivImgAttrib& exif, int i) {
-    exif.image_id = images[i]->id();
-    exif.iso_speed = static_cast<float>(100 << (i % 6));
-    exif.shutter_speed = 1.0f / static_cast<float>(1 + i % 500);
-    exif.f_number = 1.4f + static_cast<float>(i % 10);
-    exif.focal_length = static_cast<float>(16 + i % 200);
-    exif.bps = 14;
-    exif.camera_maker = L"Fujifilm";
-    exif.camera_model = L"X-T" + std::to_wstring(i % 5);
-    exif.lens_pretty_name = L"XF" + std::to_wstring(16 + i % 8) + L"mm";
-    exif.date = 1'500'000'000 + i;
-    exif.raw = i % 2 == 0;
-  });
-}
-
-// One state per image, its current one, written in one engine call.
-void fillStates(dbcore::DBReactor& reactor, const std::vector<std::shared_ptr<dbcore::DBImage>>& images) {
-  using namespace dbcore;
-  std::map<std::shared_ptr<DBImage>, std::pair<std::vector<std::shared_ptr<DBImgHistoryState>>, long long>>
-      states;
-  for (int i = 0; i < kImages; ++i) {
-    auto state = std::make_shared<DBImgHistoryState>();
-    state->action_name = L"Import";
-    state->guid = L"STATE-" + std::to_wstring(i);
-    state->image_orientation = static_cast<uint64_t>(i % 8);
-    state->original = true;
-    states.emplace(images[i], std::make_pair(std::vector{std::move(state)}, 0LL));
-  }
-  reactor.SetStatesByVector<DBImage, DBImgHistoryState>(states);
-}
-
-void fill(dbcore::DBReactor& reactor) {
-  const auto folders = fillFolders(reactor);
-  const auto images = fillImages(reactor);
-  fillAttributes(reactor, images);
-  std::vector<std::pair<std::shared_ptr<dbcore::DBPath>, std::shared_ptr<dbcore::DBImage>>> pairs;
-  pairs.reserve(kImages);
-  for (int i = 0; i < kImages; ++i) pairs.emplace_back(folders[i % kFolders], images[i]);
-  reactor << pairs;
-  fillStates(reactor, images);
-}
-
-void buildCatalog(const std::string& path) {
-  for (const char* suffix : {"", "-wal", "-shm"}) std::filesystem::remove(path + suffix);
-  const auto catalog = KRDBCatalog::initWithContentsOfFile(path, nullptr);
-  require(catalog != nullptr, "catalog created");
-  catalog->initializeAndUpdateIfNeaded();
-  catalog->performSynchronously(true, [&] { fill(*catalog->dbReactor()); });
-  catalog->forceCloseDB();
 }
 
 // ---- Raw
@@ -500,7 +395,7 @@ int main() {
   KRRunLoop::designateMainThread();
   KRDBEntityClasses::registerAll();
   const std::string path = scratch.file("context.krcatalog");
-  const double building = KRBenchSqlite::timed([&] { buildCatalog(path); });
+  const double building = KRBenchSqlite::timed([&] { KRBenchCatalog::build(path, kImages, kFolders); });
   std::printf("BUILD_S %.1f\n", building);
   const double raw = rawSeconds(path);
   double bytesPerImage = 0;

@@ -1,21 +1,34 @@
 // A live filter over 1,000,000 images sorted by capture date, kept up to date incrementally, against a
 // plain sorted std::vector of pointers with an std::unordered_map from pointer to position to which the
-// same changes are applied by binary search, rotation and re-indexing of the moved range only.
+// same changes are applied by binary search, rotation and re-indexing of the moved range only. Then, end
+// to end over a catalog of 10,000 images, the time from a rating edit until three live filters (all
+// images, a subfilter of them, and the intersection of both) have announced the change.
 #include <algorithm>
 #include <cstdio>
 #include <cstdlib>
 #include <memory>
+#include <set>
+#include <string>
 #include <unordered_map>
 #include <vector>
 
+#include "KRBenchCatalog.hpp"
 #include "KRBenchSqlite.hpp"
+#include "KRFoundation/KRDate.hpp"
+#include "KRFoundation/KRPredicate.hpp"
 #include "KRFoundation/KRRunLoop.hpp"
 #include "KRFoundation/KRSortDescriptor.hpp"
+#include "Model/KRDBCatalog/KRDBCatalog.hpp"
+#include "Model/KRDBContext/KRDBContext.hpp"
 #include "Model/KRDBEntitiesFilter/KRDBEntitiesChangesStorage.hpp"
 #include "Model/KRDBEntitiesFilter/KRDBEntitiesFilter.hpp"
+#include "Model/KRDBEntitiesFilter/KRDBEntitiesSubfilter.hpp"
+#include "Model/KRDBEntitiesFilter/KRDBIntersectEntitiesFilter.hpp"
 #include "Model/KRDBEntity/KRDBEntityClasses.hpp"
 #include "Model/KRDBImage/KRDBImage.hpp"
+#include "Model/KRDBImageAttributes/KRDBImageAttributes.hpp"
 #include "dbimage.hpp"
+#include "support/KRTemporaryDirectory.hpp"
 
 namespace {
 
@@ -192,6 +205,64 @@ std::pair<double, double> bulkSeconds(KRDBEntitiesFilter& filter, RawList& raw) 
   return {ours, rawSeconds};
 }
 
+// ---- End to end: an edit until three live filters over a context have heard of it
+
+constexpr int kEditedCatalogImages = 10000;
+constexpr int kEdits = 500;
+
+// Remembers which filters announced a change since the last clear.
+class KRNotifiedFilters : public KRObject, public KRDBEntitesFilterUpdateProtocol {
+ public:
+  void entitiesFilterDidChange(const std::shared_ptr<KRDBEntitiesFilter>& filter,
+                               const KRDictionary&) override {
+    notified.insert(filter.get());
+  }
+  std::set<const KRDBEntitiesFilter*> notified;
+};
+
+KRDBEntitySet obtained(const std::shared_ptr<KRDBEntitiesFilter>& filter) {
+  KRDBEntitySet entities;
+  bool done = false;
+  filter->obtainEntities([&](const KRDBEntitiesFilter::EntitySetPtr& set) {
+    if (set) entities = *set;
+    done = true;
+  });
+  KRRunLoop::mainRunLoop()->runUntil([&done] { return done; }, KRDate::distantFuture());
+  return entities;
+}
+
+double editToNotifyMicroseconds(const std::string& path) {
+  KRBenchCatalog::build(path, kEditedCatalogImages, 100);
+  const auto context = KRDBContext::initWithCatalog(KRDBCatalog::initWithContentsOfFile(path, nullptr));
+  require(context != nullptr, "context");
+  const auto all = context->allImagesFilter();
+  const auto subfilter = KRDBEntitiesSubfilter::initWithEntitiesFilter(all);
+  subfilter->setPredicate(KRPredicate::predicateWithValue(true));
+  const auto both = KRDBIntersectEntitiesFilter::initWithEntitiesFilters({all, subfilter});
+  const auto listener = std::make_shared<KRNotifiedFilters>();
+  const std::vector<std::shared_ptr<KRDBEntitiesFilter>> filters{all, subfilter, both};
+  for (const auto& filter : filters) {
+    require(obtained(filter).size() == kEditedCatalogImages, "filter obtained");
+    filter->addListener(listener);
+  }
+  const auto images = obtained(all);
+  auto image = images.begin();
+  double seconds = 0;
+  for (int edit = 0; edit < kEdits; ++edit, ++image) {
+    const auto attributes = std::static_pointer_cast<KRDBImage>(*image)->attributesPrimitive();
+    listener->notified.clear();
+    seconds += KRBenchSqlite::timed([&] {
+      attributes->setRating((attributes->rating() + 1) % 6);
+      KRRunLoop::mainRunLoop()->runUntil([&] { return listener->notified.size() == filters.size(); },
+                                         KRDate::distantFuture());
+    });
+  }
+  bool closed = false;
+  context->closeAfterAllDataBaseOperationsWithHandler([&closed] { closed = true; });
+  KRRunLoop::mainRunLoop()->runUntil([&closed] { return closed; }, KRDate::distantFuture());
+  return seconds * 1e6 / kEdits;
+}
+
 }  // namespace
 
 int main() {
@@ -212,6 +283,7 @@ int main() {
   std::printf("FILTER_UPDATE_IN_PLACE_US %.1f\n", inPlace);
   std::printf("RATIO filter_reorder %.3f\n", reorderRaw / reorderOurs);
   std::printf("RATIO filter_bulk_update %.3f\n", bulkRaw / bulkOurs);
-  std::printf("EDIT_TO_NOTIFY_US not measured yet\n");
+  const KRTemporaryDirectory scratch;
+  std::printf("EDIT_TO_NOTIFY_US %.1f\n", editToNotifyMicroseconds(scratch.file("edits.krcatalog")));
   return 0;
 }

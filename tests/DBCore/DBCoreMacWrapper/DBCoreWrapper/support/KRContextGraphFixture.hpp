@@ -12,8 +12,8 @@
 #include "Model/KRDBReferencedFolder/KRDBReferencedFolder.hpp"
 
 // A context over a catalog with two collections under the root (the first holding two images and a child
-// collection), three images in two folders and a referenced folder, for the tests of the operations that
-// change the graph.
+// collection), three images in two folders and a referenced folder, all as the context's cached instances,
+// for the tests of the relations and of the operations that change them.
 class KRContextGraphFixture : public testing::Test {
  protected:
   using ImagePtr = std::shared_ptr<KRDBImage>;
@@ -40,7 +40,10 @@ class KRContextGraphFixture : public testing::Test {
     second = cached(other);
     child = cached(below);
     folder = cached(referenced);
-    // The children and members that the operations work on in memory.
+  }
+
+  // Reads the children and members that the operations change in memory.
+  void loadRelations() {
     context->rootFilter()->childs();
     first->childs();
     first->images();

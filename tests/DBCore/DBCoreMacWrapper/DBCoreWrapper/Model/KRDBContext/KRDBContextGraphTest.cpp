@@ -11,7 +11,13 @@
 
 namespace {
 
-class KRDBContextGraphTest : public KRContextGraphFixture {};
+class KRDBContextGraphTest : public KRContextGraphFixture {
+ protected:
+  void SetUp() override {
+    KRContextGraphFixture::SetUp();
+    loadRelations();
+  }
+};
 
 }  // namespace
 

@@ -13,6 +13,10 @@ namespace {
 
 class KRDBContextMembershipTest : public KRContextGraphFixture {
  protected:
+  void SetUp() override {
+    KRContextGraphFixture::SetUp();
+    loadRelations();
+  }
   std::vector<int64_t> idsOf(std::initializer_list<ImagePtr> members) {
     std::vector<int64_t> ids;
     for (const auto& image : members) ids.push_back(image->entityID()->dbid());

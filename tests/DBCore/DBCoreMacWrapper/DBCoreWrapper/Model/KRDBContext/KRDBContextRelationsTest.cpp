@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "KRContextCatalog.hpp"
+#include "KRContextGraphFixture.hpp"
 #include "Model/KRDBCollection/KRDBCollection.hpp"
 #include "Model/KRDBContext/KRDBContext.hpp"
 #include "Model/KRDBEntitiesFilter/KRDBEntitiesStorage.hpp"
@@ -18,32 +18,9 @@ namespace {
 using ImagePtr = std::shared_ptr<KRDBImage>;
 using CollectionPtr = std::shared_ptr<KRDBCollection>;
 
-// Relations read through a context over a catalog with two collections under the root (the first holding
-// two images and a child collection) and a referenced folder.
-class KRDBContextRelationsTest : public testing::Test {
+// Relations read through a context.
+class KRDBContextRelationsTest : public KRContextGraphFixture {
  protected:
-  void SetUp() override {
-    folders = {store.folder("/photos/a"), store.folder("/photos/b")};
-    written = store.images(3, folders);
-    first = store.create<KRDBCollection>(KRDBEntityTypeCollection);
-    second = store.create<KRDBCollection>(KRDBEntityTypeCollection);
-    child = store.create<KRDBCollection>(KRDBEntityTypeCollection);
-    folder = store.create<KRDBReferencedFolder>(KRDBEntityTypeReferencedFolder,
-                                                {{"DBReferencedFolderPath", folders[0]}});
-    store.onQueue([&](KRDBCatalog& queue) {
-      const auto root =
-          queue.fetchEntityWithIDSync(KRDBEntityID::initWithEntityType(KRDBEntityTypeCollection, 1));
-      queue.addChildsSync({first, second}, root);
-      queue.addChildsSync({child}, first);
-      queue.addImagesSync({written[0], written[1]}, first);
-    });
-    context = KRDBContext::initWithCatalog(store.catalog());
-  }
-
-  template <class T>
-  std::shared_ptr<T> cached(const std::shared_ptr<T>& fetched) {
-    return std::static_pointer_cast<T>(context->entityWithID(fetched->entityID()));
-  }
   static std::vector<int64_t> idsOf(const KRDBEntitySet& entities) {
     std::vector<int64_t> ids;
     for (const auto& entity : entities) ids.push_back(entity->entityID()->dbid());
@@ -55,13 +32,6 @@ class KRDBContextRelationsTest : public testing::Test {
     for (const auto& entity : entities)
       EXPECT_EQ(context->cachedEntityForEntityID(entity->entityID()), entity);
   }
-
-  KRContextCatalog store;
-  std::vector<std::shared_ptr<KRDBPath>> folders;
-  std::vector<ImagePtr> written;
-  CollectionPtr first, second, child;
-  std::shared_ptr<KRDBReferencedFolder> folder;
-  std::shared_ptr<KRDBContext> context;
 };
 
 TEST_F(KRDBContextRelationsTest, TheRootCollectionHasNoParent) {
@@ -110,16 +80,16 @@ TEST_F(KRDBContextRelationsTest, ObtainingDescendantsGivesEveryLevel) {
 }
 
 TEST_F(KRDBContextRelationsTest, ImagesOfACollectionAndCollectionsOfAnImage) {
-  const KRDBEntitySet images = context->imagesOfFilter(cached(first));
-  EXPECT_EQ(idsOf(images),
-            (std::vector<int64_t>{written[0]->entityID()->dbid(), written[1]->entityID()->dbid()}));
-  expectCached(images);
-  EXPECT_EQ(context->filtersOfImage(cached(written[0])), (KRDBEntitySet{cached(first)}));
-  EXPECT_TRUE(context->filtersOfImage(cached(written[2])).empty());
+  const KRDBEntitySet members = context->imagesOfFilter(cached(first));
+  EXPECT_EQ(idsOf(members),
+            (std::vector<int64_t>{images[0]->entityID()->dbid(), images[1]->entityID()->dbid()}));
+  expectCached(members);
+  EXPECT_EQ(context->filtersOfImage(cached(images[0])), (KRDBEntitySet{cached(first)}));
+  EXPECT_TRUE(context->filtersOfImage(cached(images[2])).empty());
 }
 
 TEST_F(KRDBContextRelationsTest, AttributeRecordsAndTheirImage) {
-  const auto image = cached(written[1]);
+  const auto image = cached(images[1]);
   EXPECT_EQ(context->attributesForImage(image), image->attributesPrimitive());
   EXPECT_EQ(context->exivAttributesForImage(image), image->exivAttributesPrimitive());
   EXPECT_EQ(context->imageForAttributes(image->attributesPrimitive()), image);
@@ -137,7 +107,7 @@ TEST_F(KRDBContextRelationsTest, FolderPathAndVolume) {
 }
 
 TEST_F(KRDBContextRelationsTest, HistoryStatesOfAnImage) {
-  const auto image = cached(written[2]);
+  const auto image = cached(images[2]);
   const KRDBImageStates states = context->statesForImage(image);
   ASSERT_EQ(states.size(), 1u);
   EXPECT_EQ(states[0], image->currentStatePrimitive());
@@ -152,8 +122,8 @@ TEST_F(KRDBContextRelationsTest, CurrentStatesOfEveryImageAreCachedInstances) {
     called = true;
   });
   ASSERT_TRUE(KRContextCatalog::runUntil([&] { return called; }));
-  ASSERT_EQ(delivered.size(), written.size());
-  for (const auto& image : written) {
+  ASSERT_EQ(delivered.size(), images.size());
+  for (const auto& image : images) {
     const auto state = delivered.at(image->entityID()->dbid());
     EXPECT_EQ(context->cachedEntityForEntityID(state->entityID()), state);
   }

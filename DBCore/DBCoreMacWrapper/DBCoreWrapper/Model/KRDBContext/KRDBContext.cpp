@@ -37,7 +37,11 @@ std::shared_ptr<KRDBContext> KRDBContext::initWithCatalog(std::shared_ptr<KRDBCa
   return context;
 }
 
-KRDBContext::~KRDBContext() = default;
+KRDBContext::~KRDBContext() {
+  // An image and its collections hold each other once both relations were read: dropping the images'
+  // cached relations lets them all go with the context.
+  for (const auto& image : fetchedEntities_->allEntitiesWithType(KRDBEntityTypeImage)) image->reset();
+}
 
 void KRDBContext::buildRootsAndServices() {
   rootFilter_ = std::dynamic_pointer_cast<KRDBCollection>(

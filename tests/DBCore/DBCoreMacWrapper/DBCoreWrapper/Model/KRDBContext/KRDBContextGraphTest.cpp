@@ -139,3 +139,16 @@ TEST_F(KRDBContextGraphTest, TheSubfoldersOfAFolderAreAllBelowItButNotItself) {
   EXPECT_FALSE(below.contains(context->rootFilter()));
   EXPECT_EQ(KRDBContext::recursiveSubfolders(first), KRDBEntitySet{child});
 }
+
+TEST_F(KRDBContextGraphTest, ImagesAndTheirCollectionsGoWithTheContext) {
+  const std::weak_ptr<KRDBImage> image = images[0];
+  const std::weak_ptr<KRDBCollection> collection = first;
+  ASSERT_TRUE(image.lock()->filtersPrimitive()->contains(first));
+  images.clear();
+  first.reset();
+  second.reset();
+  child.reset();
+  context.reset();
+  EXPECT_TRUE(image.expired());
+  EXPECT_TRUE(collection.expired());
+}

@@ -26,7 +26,10 @@ class KRDBReferencedFolder;
 
 // The object graph over one open catalog: at most one live entity object per identifier. Every entity
 // that reaches the application (fetched by identifier, by request or as a linked record) passes through
-// the cache first, and is handed out only once the records it cannot be used without are attached.
+// the cache first, and is handed out only once the records it cannot be used without are attached. The
+// context observes its entities and gathers their changes into one pass per turn of the main run loop (the
+// catalog's writes, one change set for its observers, one undo step); it creates and deletes entities and
+// changes their relations, memory first and then the catalog.
 //
 // The context lives on the main thread: catalog results arrive there, and the cache, the preparation of
 // entities and the callbacks run there; the cache is not locked. entityWithID and preparedEntity turn the

@@ -191,6 +191,10 @@ class KRDBCatalog : public KRAbstractModel {
   void fetchImagesOfFilter(const std::shared_ptr<KRDBEntity>& filter, ResultHandler<KRDBEntityArray> handler,
                            bool sync);
   KRDBEntityArray fetchImagesOfFilter(const std::shared_ptr<KRDBEntity>& filter);
+  // The members of a collection or referenced folder among the images (of a collection, those marked to
+  // delete included).
+  KRDBEntitySet membersAmongImagesSync(const KRDBEntitySet& images,
+                                       const std::shared_ptr<KRDBEntity>& filter);
   // Adds the images not yet members to a collection or referenced folder, in one commit; answers the images
   // added.
   KRDBEntitySet addImagesSync(const KRDBEntitySet& images, const std::shared_ptr<KRDBEntity>& filter);

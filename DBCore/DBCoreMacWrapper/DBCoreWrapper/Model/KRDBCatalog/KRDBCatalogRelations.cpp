@@ -306,12 +306,26 @@ KRDBEntityArray KRDBCatalog::fetchImagesOfFilter(const std::shared_ptr<KRDBEntit
   return waitFor<KRDBEntityArray>([&](auto handler) { fetchImagesOfFilter(filter, handler, true); });
 }
 
+KRDBEntitySet KRDBCatalog::membersAmongImagesSync(const KRDBEntitySet& images,
+                                                  const std::shared_ptr<KRDBEntity>& filter) {
+  const KRDBEntityArray found = fetchImagesOfFilterSync(filter);
+  KRDBEntitySet members(found.begin(), found.end());
+  if (entityTypeOf(filter) != KRDBEntityTypeCollection) return members;
+  // The members query leaves out images marked to delete: those of the given images it did not find are
+  // asked for their own collections.
+  for (const auto& image : missingFrom(images, members)) {
+    const auto filters = fetchFiltersOfImageSync(std::dynamic_pointer_cast<KRDBImage>(image));
+    if (!missingFrom({filter}, filters).empty()) continue;
+    members.insert(image);
+  }
+  return members;
+}
+
 KRDBEntitySet KRDBCatalog::addImagesSync(const KRDBEntitySet& images,
                                          const std::shared_ptr<KRDBEntity>& filter) {
   const int64_t type = entityTypeOf(filter);
   if (type != KRDBEntityTypeCollection && type != KRDBEntityTypeReferencedFolder) return {};
-  const KRDBEntityArray members = fetchImagesOfFilterSync(filter);
-  const KRDBEntitySet added = missingFrom(images, KRDBEntitySet(members.begin(), members.end()));
+  const KRDBEntitySet added = missingFrom(images, membersAmongImagesSync(images, filter));
   const auto adding = recordsOf<DBImage>(added);
   if (type == KRDBEntityTypeCollection) {
     writeEach<std::shared_ptr<DBImage>>(
@@ -339,8 +353,7 @@ void KRDBCatalog::addImages(const KRDBEntitySet& images, const std::shared_ptr<K
 KRDBEntitySet KRDBCatalog::deleteImagesSync(const KRDBEntitySet& images,
                                             const std::shared_ptr<KRDBEntity>& filter) {
   if (entityTypeOf(filter) != KRDBEntityTypeCollection) return {};
-  const KRDBEntityArray members = fetchImagesOfFilterSync(filter);
-  const KRDBEntitySet outside = missingFrom(images, KRDBEntitySet(members.begin(), members.end()));
+  const KRDBEntitySet outside = missingFrom(images, membersAmongImagesSync(images, filter));
   KRDBEntitySet removing;
   for (const auto& image : images) {
     if (image && !outside.contains(image)) removing.insert(image);

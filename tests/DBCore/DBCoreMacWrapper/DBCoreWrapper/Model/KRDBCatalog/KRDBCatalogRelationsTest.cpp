@@ -297,6 +297,25 @@ TEST_F(KRDBCatalogRelationsTest, AnImageAddedTwiceToACollectionIsAMemberOnce) {
   EXPECT_EQ(idsOf(catalog->fetchFiltersOfImage(first)), std::vector<int64_t>{dbidOf(trip)});
 }
 
+TEST_F(KRDBCatalogRelationsTest, AMemberMarkedToDeleteIsStillAMemberForAddingAndRemoving) {
+  const auto trip = collection();
+  const auto marked = image();
+  catalog->addImages({marked}, trip, nullptr, true);
+  marked->setMarkedToDelete(true);
+  catalog->updateEntitiesSync({marked});
+  ASSERT_TRUE(catalog->fetchImagesOfFilter(trip).empty());
+  KRDBEntitySet added{marked};
+  catalog->addImages(
+      {marked}, trip, [&added](KRDBEntitySet answer) { added = std::move(answer); }, true);
+  EXPECT_TRUE(added.empty());
+  EXPECT_EQ(rows("filter_images"), 1);
+  KRDBEntitySet removed;
+  catalog->deleteImages(
+      {marked}, trip, [&removed](KRDBEntitySet answer) { removed = std::move(answer); }, true);
+  EXPECT_EQ(removed, KRDBEntitySet{marked});
+  EXPECT_EQ(rows("filter_images"), 0);
+}
+
 TEST_F(KRDBCatalogRelationsTest, RemovingAnImageThatIsNotInTheCollectionDoesNothing) {
   const auto trip = collection();
   const auto other = collection();

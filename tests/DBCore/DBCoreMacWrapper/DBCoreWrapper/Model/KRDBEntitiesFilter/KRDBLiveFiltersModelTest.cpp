@@ -113,11 +113,7 @@ class KRDBLiveFiltersModelTest : public testing::Test {
   void edit(std::mt19937& random) {
     const auto image = images[random() % images.size()];
     undoManager->beginUndoGrouping();
-    unsigned kind = random() % 4;
-    // The catalog's membership operations do not see the links of images marked to delete (its members
-    // query leaves them out), so memory and catalog would part there: such images are rated instead.
-    if (kind >= 2 && image->isMarkedToDelete()) kind = 0;
-    switch (kind) {
+    switch (random() % 4) {
       case 0:
         image->attributesPrimitive()->setRating(static_cast<int32_t>(random() % 6));
         break;

@@ -7,6 +7,7 @@
 #include <thread>
 
 #include "KRCommitCounter.hpp"
+#include "KRContextCatalog.hpp"
 #include "KRFoundation/KRException.hpp"
 #include "KRFoundation/KRRunLoop.hpp"
 #include "KRServices/KRCapturingLogSink.hpp"
@@ -24,7 +25,6 @@
 #include "Model/KRDBSmartFilter/KRDBSmartFilter.hpp"
 #include "Model/KRDBVolume/KRDBVolume.hpp"
 #include "dbreactor.hpp"
-#include "support/KRTemporaryDirectory.hpp"
 
 namespace {
 
@@ -76,31 +76,19 @@ void expectRaisesTagged(const std::function<void()>& action, const std::string& 
 
 class KRDBCatalogRelationsTest : public testing::Test {
  protected:
-  void SetUp() override {
-    catalog = KRDBCatalog::initWithContentsOfFile(path(), nullptr);
-    ASSERT_TRUE(catalog);
-    catalog->initializeAndUpdateIfNeaded();
-    counter = std::make_unique<KRCommitCounter>(path());
-  }
+  void SetUp() override { counter = std::make_unique<KRCommitCounter>(path()); }
 
-  std::string path() const { return directory.file("catalog.krcatalog"); }
+  std::string path() const { return store.file("catalog.krcatalog"); }
 
   // A catalog over a second file whose schema was never made: every engine read and write fails.
   std::shared_ptr<KRDBCatalog> catalogWithoutSchema() const {
-    return KRDBCatalog::initWithContentsOfFile(directory.file("empty.krcatalog"), nullptr);
+    return KRDBCatalog::initWithContentsOfFile(store.file("empty.krcatalog"), nullptr);
   }
 
-  // Runs work on the catalog's queue and waits for it.
-  void onQueue(const std::function<void(KRDBCatalog&)>& work) {
-    catalog->performSynchronously(true, [&] { work(*catalog); });
-  }
+  void onQueue(const std::function<void(KRDBCatalog&)>& work) { store.onQueue(work); }
   template <class T>
   std::shared_ptr<T> create(int64_t type, const KRDictionary& info = {}) {
-    std::shared_ptr<T> created;
-    onQueue([&](KRDBCatalog& queue) {
-      created = std::dynamic_pointer_cast<T>(queue.createEntityWithTypeSync(type, info));
-    });
-    return created;
+    return store.create<T>(type, info);
   }
   std::shared_ptr<KRDBCollection> collection() { return create<KRDBCollection>(KRDBEntityTypeCollection); }
   std::shared_ptr<KRDBImage> image() { return create<KRDBImage>(KRDBEntityTypeImage); }
@@ -147,8 +135,8 @@ class KRDBCatalogRelationsTest : public testing::Test {
     ASSERT_TRUE(runMainLoopUntil([&drained] { return drained; }));
   }
 
-  KRTemporaryDirectory directory;
-  std::shared_ptr<KRDBCatalog> catalog;
+  KRContextCatalog store;
+  std::shared_ptr<KRDBCatalog> catalog = store.catalog();
   std::unique_ptr<KRCommitCounter> counter;
 };
 

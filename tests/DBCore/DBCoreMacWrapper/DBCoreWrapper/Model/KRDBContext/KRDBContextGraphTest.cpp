@@ -8,6 +8,7 @@
 #include "Model/KRDBEntityFavoriteAlias/KRDBEntityFavoriteAlias.hpp"
 #include "Model/KRDBImageExivAttributes/KRDBImageExivAttributes.hpp"
 #include "Model/KRDBVolume/KRDBVolume.hpp"
+#include "dbpath.hpp"
 
 namespace {
 
@@ -51,6 +52,31 @@ TEST_F(KRDBContextGraphTest, UndoingACreationDeletesTheCreatedEntity) {
   ASSERT_TRUE(undoManager->canUndo());
   undoManager->undo();
   EXPECT_TRUE(created->isMarkedToDelete());
+}
+
+TEST_F(KRDBContextGraphTest, SeveralEntitiesCreatedFromOneInfoEachTakeThatInfo) {
+  auto record = std::make_shared<dbcore::DBPath>();
+  record->path = KRString("/trips").krs_wstring();
+  const KRDictionary plain{{"unused", true}};
+  const KRDictionary info{
+      {"DBReferencedFolderPath", KRDBPath::initWithDBEntity(record)},
+      {"DBPathInfoVolume", folders[0]->volume()},
+      {"DBReferencedFolderChildsPaths", KRDictionary{{"/trips/a", plain}, {"/trips/b", plain}}}};
+  KRDBEntityArray created;
+  context->createEntitiesWithType(
+      KRDBEntityTypeReferencedFolder, std::optional(std::vector{info}),
+      [&created](const KRDBEntityArray& entities) { created = entities; }, true);
+  ASSERT_EQ(created.size(), 3u);
+  for (const auto& entity : created) {
+    const auto made = std::static_pointer_cast<KRDBReferencedFolder>(entity);
+    EXPECT_EQ(context->cachedEntityForEntityID(made->entityID()), made);
+    EXPECT_TRUE(context->addedEntities().contains(made));
+    // The info's child paths make each folder's own path a created entity too.
+    EXPECT_TRUE(context->addedEntities().contains(made->dbPath()));
+  }
+  const auto top = std::static_pointer_cast<KRDBReferencedFolder>(created[0]);
+  EXPECT_EQ(*top->childsPrimitive(), (KRDBEntitySet{created[1], created[2]}));
+  finishTurn();
 }
 
 TEST_F(KRDBContextGraphTest, AppliedInfoGivesAnImageItsImportIndexAndDate) {

@@ -57,16 +57,29 @@ void KRAbstractModel::rebuildPositions() {
 void KRAbstractModel::eraseAt(size_t position) {
   if (!moreListeners_) return onlyListener_.reset();
   auto& entries = moreListeners_->entries;
-  entries.erase(entries.begin() + static_cast<std::ptrdiff_t>(position));
-  rebuildPositions();
+  const auto& index = moreListeners_->index;
+  if (!index) {
+    entries.erase(entries.begin() + static_cast<std::ptrdiff_t>(position));
+    return;
+  }
+  if (const auto held = entries[position].lock()) index->positions.erase(held.get());
+  entries[position].reset();
+  if (2 * ++index->emptied > entries.size()) dropEntries();
 }
 
 void KRAbstractModel::dropGoneListeners() {
-  auto& index = moreListeners_->index;
+  const auto& index = moreListeners_->index;
   if (index && moreListeners_->entries.size() < index->pruneAt) return;
+  dropEntries();
+}
+
+void KRAbstractModel::dropEntries() {
   std::erase_if(moreListeners_->entries, [](const auto& entry) { return entry.expired(); });
   rebuildPositions();
-  if (index) index->pruneAt = 2 * moreListeners_->entries.size();
+  if (const auto& index = moreListeners_->index) {
+    index->pruneAt = 2 * moreListeners_->entries.size();
+    index->emptied = 0;
+  }
 }
 
 void KRAbstractModel::append(const std::shared_ptr<KRObject>& listener) {

@@ -51,10 +51,12 @@ class KRAbstractModel : public KRObject {
   KRAbstractModel() = default;
 
  private:
-  // The position of each live observer, and the list size at which dead entries are dropped next.
+  // The position of each live observer, the list size at which dead entries are dropped next, and the
+  // number of entries emptied by removal since they were last dropped.
   struct Index {
     std::unordered_map<const KRObject*, size_t> positions;
     size_t pruneAt = 0;
+    size_t emptied = 0;
   };
   // The observers once there have been two at a time; lists longer than kIndexedListeners get an index.
   struct Listeners {
@@ -73,7 +75,10 @@ class KRAbstractModel : public KRObject {
   size_t listedPositionOf(const KRObject* listener) const;
   // Adds an observer known not to be listed, moving to the list form at the second one.
   void append(const std::shared_ptr<KRObject>& listener);
+  // Removes the entry; in an indexed list it is emptied instead, and the empty entries are dropped once
+  // they are half the list, so that removing each of many observers costs amortised constant time.
   void eraseAt(size_t position);
+  void dropEntries();
   // Drops the entries of observers that are gone: at every addition while the list is short, otherwise
   // once it has doubled since the last time, so that dead entries cost amortised constant time.
   void dropGoneListeners();

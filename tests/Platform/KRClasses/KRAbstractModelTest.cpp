@@ -136,6 +136,28 @@ TEST(KRAbstractModelTest, ManyObserversKeepTheirOrderAndAreFoundAndRemoved) {
   EXPECT_EQ(log, expected);
 }
 
+TEST(KRAbstractModelTest, RemovingMostOfManyObserversKeepsTheRestInOrderAndTheListShort) {
+  std::vector<std::string> log;
+  auto model = std::make_shared<Model>();
+  std::vector<std::shared_ptr<Recorder>> recorders;
+  for (int index = 0; index < 1000; ++index) {
+    recorders.push_back(std::make_shared<Recorder>(std::to_string(index), &log));
+    model->addListener(recorders.back());
+  }
+  for (int index = 0; index < 1000; ++index) {
+    if (index % 100 != 7) model->removeListener(recorders[static_cast<size_t>(index)]);
+  }
+  EXPECT_FALSE(model->hasListener(recorders[8]));
+  EXPECT_TRUE(model->hasListener(recorders[907]));
+  model->notifyObserversWithSelector(&ChangeObserver::modelDidChange, model.get(), KRDictionary{{"key", 1}});
+  std::vector<std::string> expected;
+  for (int index = 7; index < 1000; index += 100) expected.push_back(std::to_string(index) + ":1");
+  EXPECT_EQ(log, expected);
+  for (int index = 7; index < 1000; index += 100)
+    model->removeListener(recorders[static_cast<size_t>(index)]);
+  EXPECT_FALSE(model->hasListeners());
+}
+
 TEST(KRAbstractModelTest, EntriesOfDeadObserversAreDroppedAsTheListGrows) {
   auto model = std::make_shared<Model>();
   std::vector<std::string> log;

@@ -166,6 +166,18 @@ std::shared_ptr<Entity> wrap(const std::shared_ptr<DBEntity>& record) {
   return Entity::initWithDBEntity(record);
 }
 
+// Gives a new image its two attribute records as entities, linked both ways, so that it is complete in
+// memory as it is in the catalog.
+void attachAttributes(const std::shared_ptr<KRDBImage>& image, const std::shared_ptr<DBUserImgAttrib>& user,
+                      const std::shared_ptr<DBExivImgAttrib>& exif) {
+  const auto attributes = wrap<KRDBImageAttributes>(user);
+  attributes->setImagePrimitive(image);
+  image->setAttributesPrimitive(attributes);
+  const auto exivAttributes = wrap<KRDBImageExivAttributes>(exif);
+  exivAttributes->setImagePrimitive(image);
+  image->setExivAttributesPrimitive(exivAttributes);
+}
+
 // Fills an image record from its info: the reader's size, file size and dates, the import date and index
 // and the name.
 std::shared_ptr<DBImage> imageRecord(const CreationInfo& info,
@@ -442,6 +454,10 @@ KRDBEntityArray KRDBCatalog::createDBImagesWithEntitiesInfo(const std::vector<KR
         });
       },
       kCreateImageArrayOperation, true);
+  for (size_t index = 0; index < images.size(); ++index) {
+    attachAttributes(std::static_pointer_cast<KRDBImage>(images[index]), userAttributes[index],
+                     exifAttributes[index]);
+  }
   return images;
 }
 

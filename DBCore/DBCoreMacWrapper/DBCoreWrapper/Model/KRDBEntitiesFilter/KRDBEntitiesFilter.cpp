@@ -220,16 +220,18 @@ void KRDBEntitiesFilter::processChanges(const ChangesStoragePtr& changes) {
   EntitySetPtr deleted;
   EntitySetPtr reordered;
   EntitySetPtr updated;
+  // The deleted and updated entities are pending before the added ones are placed: they may have left
+  // their place.
+  const bool anyDeleted = isNonEmpty(changes->deletedEntities());
+  const bool anyUpdated = isNonEmpty(changes->updatedEntities());
+  if (anyDeleted) unite(deletedEntities_, changes->deletedEntities());
+  if (anyUpdated) unite(updatedEntities_, changes->updatedEntities());
   if (isNonEmpty(changes->addedEntities())) {
     unite(addedEntities_, changes->addedEntities());
     unite(added, processAddedEntities());
   }
-  if (isNonEmpty(changes->deletedEntities())) {
-    unite(deletedEntities_, changes->deletedEntities());
-    unite(deleted, processDeleteEntities());
-  }
-  if (isNonEmpty(changes->updatedEntities())) {
-    unite(updatedEntities_, changes->updatedEntities());
+  if (anyDeleted) unite(deleted, processDeleteEntities());
+  if (anyUpdated) {
     const ProcessedUpdates processed = processUpdateEntities();
     unite(reordered, processed.reordered);
     unite(added, processed.added);

@@ -159,12 +159,20 @@ class KRDBEntitiesFilter : public KRAbstractModel {
   // The one reordered entity of a pass that adds and removes nothing, moved to its place in the array.
   void moveReorderedEntity(const EntityPtr& entity);
   void insertIntoSortedEntities(const EntityArray& entered);
+  // Whether the entity is among the pending updated or deleted ones.
+  bool isPendingChange(const EntityPtr& entity) const;
   // Drops the removed entities from the sorted array and their index entries, and takes the taken-out
   // ones out of the array (keeping their entries, to be set again).
   void removeFromSortedEntities(const KRDBEntitySet& removed, const KRDBEntitySet& takenOut);
   std::vector<uint8_t> membershipOf(const EntityArray& candidates) const;
   // Whether a neighbour in the sorted array now orders wrongly against the entity.
   bool isOutOfOrder(const EntityPtr& entity) const;
+  // Neighbours that changed together can each look in place against the other while their run sits
+  // wrongly among the unchanged entities: within every run of updated, staying entities, those that would
+  // leave the rest out of order are taken as reordered too.
+  void reorderDisorderedRuns(const EntityArray& staying, KRDBEntitySet& reordered) const;
+  // The first and last position of the run of updated entities around a position.
+  std::pair<size_t, size_t> updatedRunAround(size_t position) const;
   // The entity's position in the sorted array: its index entry, or, when it has none (logged as an
   // inconsistency), its place found by searching; the array's size when it is not there.
   size_t sortedPositionOf(const EntityPtr& entity) const;

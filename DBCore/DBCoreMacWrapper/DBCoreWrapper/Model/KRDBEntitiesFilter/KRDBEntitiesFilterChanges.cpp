@@ -2,6 +2,8 @@
 // the set, the sorted array and the index without sorting the whole array again.
 #include <algorithm>
 #include <cstdint>
+#include <unordered_set>
+#include <utility>
 #include <vector>
 
 #include "KRFoundation/KRConcurrentQueue.hpp"
@@ -59,6 +61,11 @@ KRDBEntitiesFilter::EntitySetPtr KRDBEntitiesFilter::processAddedEntities() {
   return entered;
 }
 
+bool KRDBEntitiesFilter::isPendingChange(const EntityPtr& entity) const {
+  return (updatedEntities_ && updatedEntities_->contains(entity)) ||
+         (deletedEntities_ && deletedEntities_->contains(entity));
+}
+
 void KRDBEntitiesFilter::insertIntoSortedEntities(const EntityArray& entered) {
   EntityArray& array = writableSortedEntities();
   if (sortingDisabled_) {
@@ -67,13 +74,16 @@ void KRDBEntitiesFilter::insertIntoSortedEntities(const EntityArray& entered) {
     indexFrom(first);
     return;
   }
-  // The old entity goes first only when it is ordered strictly before the new one.
+  // The old entity goes first only when it is ordered strictly before the new one. An old entity updated
+  // or deleted in the same pass may no longer be in its place: it is passed over here, to be placed with
+  // the updates or removed.
   EntityArray merged;
   merged.reserve(array.size() + entered.size());
   size_t old = 0;
   size_t fresh = 0;
   while (old < array.size() && fresh < entered.size()) {
-    const bool oldFirst = compareEntity(array[old], entered[fresh]) == KROrderedAscending;
+    const bool oldFirst =
+        isPendingChange(array[old]) || compareEntity(array[old], entered[fresh]) == KROrderedAscending;
     merged.push_back(oldFirst ? array[old++] : entered[fresh++]);
   }
   merged.insert(merged.end(), array.begin() + static_cast<std::ptrdiff_t>(old), array.end());
@@ -130,6 +140,7 @@ KRDBEntitiesFilter::ProcessedUpdates KRDBEntitiesFilter::processUpdateEntities()
   const std::vector<uint8_t> satisfied = membershipOf(candidates);
   ProcessedUpdates outcome{emptySet(), emptySet(), emptySet(), emptySet()};
   const bool checkOrder = sortedEntities_ && !sortingDisabled_;
+  EntityArray staying;
   for (size_t index = 0; index < candidates.size(); ++index) {
     const EntityPtr& entity = candidates[index];
     const bool member = entities_->contains(entity);
@@ -137,8 +148,14 @@ KRDBEntitiesFilter::ProcessedUpdates KRDBEntitiesFilter::processUpdateEntities()
     if (!member && satisfied[index]) outcome.added->insert(entity);
     if (!satisfied[index]) continue;
     outcome.updated->insert(entity);
-    if (member && checkOrder && isOutOfOrder(entity)) outcome.reordered->insert(entity);
+    if (!member || !checkOrder) continue;
+    if (isOutOfOrder(entity)) {
+      outcome.reordered->insert(entity);
+    } else {
+      staying.push_back(entity);
+    }
   }
+  if (candidates.size() > 1) reorderDisorderedRuns(staying, *outcome.reordered);
   applyUpdates(outcome);
   updatedEntities_.reset();
   return outcome;
@@ -166,6 +183,51 @@ bool KRDBEntitiesFilter::isOutOfOrder(const EntityPtr& entity) const {
   if (position >= array.size()) return false;
   if (position > 0 && compareEntity(array[position - 1], entity) == KROrderedDescending) return true;
   return position + 1 < array.size() && compareEntity(entity, array[position + 1]) == KROrderedDescending;
+}
+
+void KRDBEntitiesFilter::reorderDisorderedRuns(const EntityArray& staying, KRDBEntitySet& reordered) const {
+  const EntityArray& array = *sortedEntities_;
+  const KRDBEntitySet keep(staying.begin(), staying.end());
+  std::unordered_set<size_t> runsSeen;
+  for (const auto& entity : staying) {
+    const size_t position = sortedPositionOf(entity);
+    if (position >= array.size()) continue;
+    const auto [first, last] = updatedRunAround(position);
+    if (first == last || !runsSeen.insert(first).second) continue;
+    // A sorted stack of the run's kept entities after the unchanged entity before it: an updated entity
+    // that orders after a later one leaves it; one that orders before an unchanged one is not taken.
+    std::vector<std::pair<EntityPtr, bool>> kept;
+    if (first > 0) kept.emplace_back(array[first - 1], false);
+    const auto orderedBefore = [this, &kept](const EntityPtr& next) {
+      return kept.empty() || compareEntity(kept.back().first, next) != KROrderedDescending;
+    };
+    const auto popUpdatedAfter = [&](const EntityPtr& next) {
+      while (!orderedBefore(next) && kept.back().second) {
+        reordered.insert(kept.back().first);
+        kept.pop_back();
+      }
+    };
+    for (size_t position = first; position <= last; ++position) {
+      const EntityPtr& next = array[position];
+      if (!keep.contains(next)) continue;
+      popUpdatedAfter(next);
+      if (orderedBefore(next)) {
+        kept.emplace_back(next, true);
+      } else {
+        reordered.insert(next);
+      }
+    }
+    if (last + 1 < array.size()) popUpdatedAfter(array[last + 1]);
+  }
+}
+
+std::pair<size_t, size_t> KRDBEntitiesFilter::updatedRunAround(size_t position) const {
+  const EntityArray& array = *sortedEntities_;
+  size_t first = position;
+  size_t last = position;
+  while (first > 0 && updatedEntities_->contains(array[first - 1])) --first;
+  while (last + 1 < array.size() && updatedEntities_->contains(array[last + 1])) ++last;
+  return {first, last};
 }
 
 void KRDBEntitiesFilter::applyUpdates(const ProcessedUpdates& outcome) {

@@ -4,6 +4,7 @@
 
 #include <functional>
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -58,17 +59,16 @@ class KRContextCatalog {
     return std::static_pointer_cast<KRDBPath>(paths.at(0));
   }
   // `count` images spread over the folders, each with a current state; returns them in creation order.
+  // `takenAt` gives the capture date (seconds since 1970) of the image at an index; without it every
+  // image has the reader's fixed one.
   std::vector<std::shared_ptr<KRDBImage>> images(int count,
-                                                 const std::vector<std::shared_ptr<KRDBPath>>& folders) {
+                                                 const std::vector<std::shared_ptr<KRDBPath>>& folders,
+                                                 const std::function<double(int)>& takenAt = nullptr) {
     std::vector<std::shared_ptr<KRDBImage>> made;
     for (int index = 0; index < count; ++index) {
       const std::string name = "IMG_" + std::to_string(index) + ".JPG";
       const KRDictionary info{
-          {"DBImageInfoExifReader",
-           KRTestExifReader::make(
-               {"/p/" + name, 600, 400, 1000 + index, KRDate::dateWithTimeIntervalSince1970(1600000000),
-                KRDate::dateWithTimeIntervalSince1970(1500000000)},
-               true)},
+          {"DBImageInfoExifReader", exifReader(name, index, takenAt)},
           {"DBImageInfoImageName", name},
           {"DBImageInfoFolderDBPath", folders[static_cast<size_t>(index) % folders.size()]}};
       KRDBEntityArray created;
@@ -80,6 +80,16 @@ class KRContextCatalog {
     }
     waitForQueue();
     return made;
+  }
+  // The reader of the image of that name and index: camera values, a size from the index.
+  static std::shared_ptr<KRTestExifReader> exifReader(const std::string& name, int index,
+                                                      const std::function<double(int)>& takenAt = nullptr) {
+    std::optional<KRDate> taken;
+    if (takenAt) taken = KRDate::dateWithTimeIntervalSince1970(takenAt(index));
+    return KRTestExifReader::make(
+        {"/p/" + name, 600, 400, 1000 + index, KRDate::dateWithTimeIntervalSince1970(1600000000),
+         KRDate::dateWithTimeIntervalSince1970(1500000000)},
+        true, std::move(taken));
   }
   // Waits on the main run loop until the catalog ran every operation queued so far.
   void waitForQueue() {

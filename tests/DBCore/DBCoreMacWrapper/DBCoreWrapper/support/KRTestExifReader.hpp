@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <utility>
 
 #include "Model/KRDBImageExivAttributes/KRDBExifReader.hpp"
@@ -19,9 +20,12 @@ class KRTestExifReader : public KRDBExifReader {
     KRDate fileCreationDate;
   };
 
-  static std::shared_ptr<KRTestExifReader> make(File file, bool withCamera = false) {
+  // `taken` replaces the fixed capture date of a reader with camera values.
+  static std::shared_ptr<KRTestExifReader> make(File file, bool withCamera = false,
+                                                std::optional<KRDate> taken = std::nullopt) {
     auto reader = std::shared_ptr<KRTestExifReader>(new KRTestExifReader(std::move(file)));
     reader->camera_ = withCamera;
+    reader->taken_ = std::move(taken);
     return reader;
   }
 
@@ -59,7 +63,8 @@ class KRTestExifReader : public KRDBExifReader {
     return camera_ ? "24-70mm F2.8" : KRDBExifReader::lensPrettyName();
   }
   KRDate date() const override {
-    return camera_ ? KRDate::dateWithTimeIntervalSince1970(1700000000.9) : KRDBExifReader::date();
+    if (!camera_) return KRDBExifReader::date();
+    return taken_ ? *taken_ : KRDate::dateWithTimeIntervalSince1970(1700000000.9);
   }
   bool isRaw() const override { return camera_ || KRDBExifReader::isRaw(); }
   bool isFullFilled() const override { return camera_ || KRDBExifReader::isFullFilled(); }
@@ -70,4 +75,5 @@ class KRTestExifReader : public KRDBExifReader {
 
   File file_;
   bool camera_ = false;
+  std::optional<KRDate> taken_;
 };

@@ -247,6 +247,22 @@ TEST_F(KRDBCatalogCreationTest, ABatchOfImagesKeepsTheOrderOfItsInfos) {
   EXPECT_EQ(rows("image_exiv_attributes"), 3);
 }
 
+TEST_F(KRDBCatalogCreationTest, ACreatedImageHoldsItsSavedAttributeRecordsLinkedBothWays) {
+  const auto image = std::dynamic_pointer_cast<KRDBImage>(
+      create(KRDBEntityTypeImage,
+             {{"DBImageInfoExifReader", reader("/p/linked")}, {"DBImageInfoOriginImageName", "o"}}));
+  ASSERT_TRUE(image);
+  const auto& attributes = image->attributesPrimitive();
+  const auto& exif = image->exivAttributesPrimitive();
+  ASSERT_TRUE(attributes);
+  ASSERT_TRUE(exif);
+  EXPECT_EQ(attributes->imagePrimitive(), image);
+  EXPECT_EQ(exif->imagePrimitive(), image);
+  EXPECT_GT(attributes->entityID()->dbid(), 0);
+  EXPECT_GT(exif->entityID()->dbid(), 0);
+  EXPECT_EQ(attributes->originName(), KRString("o"));
+}
+
 TEST_F(KRDBCatalogCreationTest, AThousandImagesCreatedInOneCallAreOneCommit) {
   const auto single = [this] { create(KRDBEntityTypeImage, {{"DBImageInfoExifReader", reader("/one")}}); };
   startCountingCommits();

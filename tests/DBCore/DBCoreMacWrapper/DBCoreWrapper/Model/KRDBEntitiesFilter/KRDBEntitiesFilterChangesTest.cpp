@@ -196,6 +196,51 @@ TEST_F(KRDBEntitiesFilterChangesTest, AnEntityTiedWithItsNeighbourIsNotReordered
   EXPECT_EQ(order(), (std::vector<int64_t>{1, 2, 3}));
 }
 
+TEST_F(KRDBEntitiesFilterChangesTest, NeighboursMovedTogetherAreReorderedThoughInOrderAgainstEachOther) {
+  filter->obtainSortedEntities(nullptr);
+  filter->pending.front()(setOf({1, 2, 3, 4, 5, 6}));
+  filter->addListener(observer);
+  // 3 and 4 both move to the front: each still orders rightly against the other.
+  rank(3, 1);
+  rank(4, 2);
+  process(nullptr, nullptr, setOf({3, 4}));
+  EXPECT_EQ(order(), (std::vector<int64_t>{3, 4, 1, 2, 5, 6}));
+  EXPECT_EQ(*published(0, KRDBEntitiesFilterReorderedEntities), *setOf({3, 4}));
+}
+
+TEST_F(KRDBEntitiesFilterChangesTest, ARunOfUpdatedNeighboursOutOfOrderInsideIsSortedAgain) {
+  // The descriptors order by rank too, so that the moved entities are merged in rank order.
+  filter->setSortDescriptors(
+      std::make_shared<const KRSortDescriptors>(KRSortDescriptors{KRSortDescriptor::sortDescriptorWithKey(
+          "entityID.dbid", true, [this](const KRValue& a, const KRValue& b) {
+            const int left = ranks.at(image(static_cast<size_t>(a.number().longLongValue())).get());
+            const int right = ranks.at(image(static_cast<size_t>(b.number().longLongValue())).get());
+            return left < right ? KROrderedAscending : left > right ? KROrderedDescending : KROrderedSame;
+          })}));
+  filter->obtainSortedEntities(nullptr);
+  filter->pending.front()(setOf({1, 2, 3, 4, 5, 6}));
+  filter->addListener(observer);
+  // Between 1 (10) and 6 (60): 2, 3, 4, 5 become 50, 55, 20, 30; the immediate neighbours of 2 and of 5
+  // order rightly, but the run does not.
+  rank(2, 50);
+  rank(3, 55);
+  rank(4, 20);
+  rank(5, 30);
+  process(nullptr, nullptr, setOf({2, 3, 4, 5}));
+  EXPECT_EQ(order(), (std::vector<int64_t>{1, 4, 5, 2, 3, 6}));
+}
+
+TEST_F(KRDBEntitiesFilterChangesTest, UpdatedNeighboursStillInOrderAreNotReordered) {
+  filter->obtainSortedEntities(nullptr);
+  filter->pending.front()(setOf({1, 2, 3, 4, 5, 6}));
+  filter->addListener(observer);
+  rank(3, 31);
+  rank(4, 39);
+  process(nullptr, nullptr, setOf({3, 4}));
+  EXPECT_EQ(observer->names(), Names{"change"});
+  EXPECT_EQ(order(), (std::vector<int64_t>{1, 2, 3, 4, 5, 6}));
+}
+
 TEST_F(KRDBEntitiesFilterChangesTest, AnEmptyUpdatedSetGivesNoOutcomeAndNoNotification) {
   obtainFirstThree();
   process(nullptr, nullptr, std::make_shared<KRDBEntitySet>());

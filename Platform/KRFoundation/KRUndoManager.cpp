@@ -178,6 +178,10 @@ void KRUndoManager::openAutomaticGroup() {
   beginUndoGrouping();
   const uint64_t serial = ++lastAutomaticSerial_;
   openGroups_.back()->automaticSerial = serial;
+  postAutomaticGroupClosing(serial);
+}
+
+void KRUndoManager::postAutomaticGroupClosing(uint64_t serial) {
   std::weak_ptr<KRUndoManager> weakSelf = std::static_pointer_cast<KRUndoManager>(shared_from_this());
   KRRunLoop::currentRunLoop()->performBlock([weakSelf, serial] {
     if (const std::shared_ptr<KRUndoManager> self = weakSelf.lock()) self->closeAutomaticGroup(serial);
@@ -185,7 +189,11 @@ void KRUndoManager::openAutomaticGroup() {
 }
 
 void KRUndoManager::closeAutomaticGroup(uint64_t serial) {
-  if (openGroups_.size() == 1 && openGroups_.front()->automaticSerial == serial) closeInnermostGroup();
+  if (openGroups_.empty() || openGroups_.front()->automaticSerial != serial) return;
+  // A group opened inside it in this turn is still open: the automatic group closes on a later turn,
+  // once that one is closed, rather than taking in the registrations of the turns to come.
+  if (openGroups_.size() > 1) return postAutomaticGroupClosing(serial);
+  closeInnermostGroup();
 }
 
 void KRUndoManager::closeOpenAutomaticGroup() {

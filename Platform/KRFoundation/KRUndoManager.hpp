@@ -94,6 +94,7 @@ class KRUndoManager : public KRObject {
   void registerAction(std::weak_ptr<const void> target, std::function<void()> invoke);
   void openAutomaticGroup();
   void closeAutomaticGroup(uint64_t serial);
+  void postAutomaticGroupClosing(uint64_t serial);
   void closeOpenAutomaticGroup();
   void closeInnermostGroup();
   void replayNewest(GroupStack& stack, Replay replay);

@@ -319,6 +319,25 @@ TEST_F(KRUndoManagerTest, GroupsByEventCloseTheGroupAtTheEndOfTheRunLoopTurn) {
   EXPECT_EQ(box_->value, 0);
 }
 
+TEST_F(KRUndoManagerTest, AnAutomaticGroupWithANestedGroupStillOpenClosesOnceThatOneIs) {
+  undo_->setGroupsByEvent(true);
+  set(box_, 1);
+  undo_->beginUndoGrouping();
+  set(box_, 2);
+  std::shared_ptr<KRRunLoop> loop = KRRunLoop::currentRunLoop();
+  // The nested group closes in a block of the turn that runs after the automatic group's closing.
+  loop->performBlock([this] { undo_->endUndoGrouping(); });
+  EXPECT_TRUE(loop->runUntil([this] { return undo_->groupingLevel() == 0; },
+                             KRDate::dateWithTimeIntervalSinceNow(5)));
+  set(box_, 3);
+  EXPECT_TRUE(loop->runUntil([this] { return undo_->groupingLevel() == 0; },
+                             KRDate::dateWithTimeIntervalSinceNow(5)));
+  undo_->undo();
+  EXPECT_EQ(box_->value, 2);
+  undo_->undo();
+  EXPECT_EQ(box_->value, 0);
+}
+
 TEST_F(KRUndoManagerTest, UndoClosesAnOpenAutomaticGroupFirst) {
   undo_->setGroupsByEvent(true);
   set(box_, 1);

@@ -191,6 +191,25 @@ TEST_F(KRDBContextChangesTest, TheChangesOfOneTurnFormOneUndoStep) {
   EXPECT_EQ(storedRating(attributes[0]), rating);
 }
 
+TEST_F(KRDBContextChangesTest, EachTurnIsAnUndoStepOfItsOwn) {
+  const auto undoManager = KRUndoManager::undoManager();
+  context->setUndoManager(undoManager);
+  const int32_t rating = attributes[0]->rating();
+  attributes[0]->setRating(rating + 1);
+  finishTurn();
+  attributes[1]->setRating(rating + 2);
+  attributes[0]->setRating(rating + 3);
+  finishTurn();
+  undoManager->undo();
+  finishTurn();
+  EXPECT_EQ(attributes[0]->rating(), rating + 1);
+  EXPECT_EQ(storedRating(attributes[0]), rating + 1);
+  undoManager->undo();
+  finishTurn();
+  EXPECT_EQ(attributes[0]->rating(), rating);
+  EXPECT_FALSE(undoManager->canUndo());
+}
+
 TEST_F(KRDBContextChangesTest, WithUndoRegistrationDisabledNoGroupIsOpened) {
   const auto undoManager = KRUndoManager::undoManager();
   undoManager->disableUndoRegistration();

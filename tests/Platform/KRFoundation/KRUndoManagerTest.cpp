@@ -36,6 +36,18 @@ class KRUndoManagerTest : public testing::Test {
     undo_->endUndoGrouping();
   }
 
+  // Ends the turn, sets 3 in a turn of its own, then undoes twice: first back to `between`, then to 0.
+  void expectTwoTurnsUndoneOneByOne(int between) {
+    std::shared_ptr<KRRunLoop> loop = KRRunLoop::currentRunLoop();
+    const auto noGroupOpen = [this] { return undo_->groupingLevel() == 0; };
+    EXPECT_TRUE(loop->runUntil(noGroupOpen, KRDate::dateWithTimeIntervalSinceNow(5)));
+    set(box_, 3);
+    EXPECT_TRUE(loop->runUntil(noGroupOpen, KRDate::dateWithTimeIntervalSinceNow(5)));
+    undo_->undo();
+    EXPECT_EQ(box_->value, between);
+    undo_->undo();
+    EXPECT_EQ(box_->value, 0);
+  }
   static void expectInconsistency(const std::function<void()>& operation) {
     try {
       operation();
@@ -307,16 +319,7 @@ TEST_F(KRUndoManagerTest, GroupsByEventCloseTheGroupAtTheEndOfTheRunLoopTurn) {
   set(box_, 2);
   EXPECT_EQ(undo_->groupingLevel(), 1);
   EXPECT_TRUE(undo_->canUndo());
-  std::shared_ptr<KRRunLoop> loop = KRRunLoop::currentRunLoop();
-  EXPECT_TRUE(loop->runUntil([this] { return undo_->groupingLevel() == 0; },
-                             KRDate::dateWithTimeIntervalSinceNow(5)));
-  set(box_, 3);
-  EXPECT_TRUE(loop->runUntil([this] { return undo_->groupingLevel() == 0; },
-                             KRDate::dateWithTimeIntervalSinceNow(5)));
-  undo_->undo();
-  EXPECT_EQ(box_->value, 2);
-  undo_->undo();
-  EXPECT_EQ(box_->value, 0);
+  expectTwoTurnsUndoneOneByOne(2);
 }
 
 TEST_F(KRUndoManagerTest, AnAutomaticGroupWithANestedGroupStillOpenClosesOnceThatOneIs) {
@@ -324,18 +327,9 @@ TEST_F(KRUndoManagerTest, AnAutomaticGroupWithANestedGroupStillOpenClosesOnceTha
   set(box_, 1);
   undo_->beginUndoGrouping();
   set(box_, 2);
-  std::shared_ptr<KRRunLoop> loop = KRRunLoop::currentRunLoop();
   // The nested group closes in a block of the turn that runs after the automatic group's closing.
-  loop->performBlock([this] { undo_->endUndoGrouping(); });
-  EXPECT_TRUE(loop->runUntil([this] { return undo_->groupingLevel() == 0; },
-                             KRDate::dateWithTimeIntervalSinceNow(5)));
-  set(box_, 3);
-  EXPECT_TRUE(loop->runUntil([this] { return undo_->groupingLevel() == 0; },
-                             KRDate::dateWithTimeIntervalSinceNow(5)));
-  undo_->undo();
-  EXPECT_EQ(box_->value, 2);
-  undo_->undo();
-  EXPECT_EQ(box_->value, 0);
+  KRRunLoop::currentRunLoop()->performBlock([this] { undo_->endUndoGrouping(); });
+  expectTwoTurnsUndoneOneByOne(2);
 }
 
 TEST_F(KRUndoManagerTest, UndoClosesAnOpenAutomaticGroupFirst) {

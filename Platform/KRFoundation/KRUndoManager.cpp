@@ -1,6 +1,7 @@
 #include "KRFoundation/KRUndoManager.hpp"
 
 #include <algorithm>
+#include <utility>
 
 #include "KRFoundation/KRException.hpp"
 #include "KRFoundation/KRRunLoop.hpp"
@@ -29,6 +30,8 @@ struct KRUndoManager::Group {
   KRString actionName{""};
   // Non-zero for a group opened automatically by groups-by-event.
   uint64_t automaticSerial = 0;
+  // Set when its turn ended while a group inside it was open: it closes on the turn after that one closes.
+  bool closingDue = false;
 
   // Runs the actions in reverse registration order, nested groups included.
   void perform() const {
@@ -190,9 +193,12 @@ void KRUndoManager::postAutomaticGroupClosing(uint64_t serial) {
 
 void KRUndoManager::closeAutomaticGroup(uint64_t serial) {
   if (openGroups_.empty() || openGroups_.front()->automaticSerial != serial) return;
-  // A group opened inside it in this turn is still open: the automatic group closes on a later turn,
-  // once that one is closed, rather than taking in the registrations of the turns to come.
-  if (openGroups_.size() > 1) return postAutomaticGroupClosing(serial);
+  // A group opened inside it is still open: the automatic group closes once that one is closed, rather
+  // than taking in the registrations of the turns to come.
+  if (openGroups_.size() > 1) {
+    openGroups_.front()->closingDue = true;
+    return;
+  }
   closeInnermostGroup();
 }
 
@@ -203,6 +209,8 @@ void KRUndoManager::closeOpenAutomaticGroup() {
 void KRUndoManager::closeInnermostGroup() {
   std::unique_ptr<Group> group = std::move(openGroups_.back());
   openGroups_.pop_back();
+  if (openGroups_.size() == 1 && std::exchange(openGroups_.front()->closingDue, false))
+    postAutomaticGroupClosing(openGroups_.front()->automaticSerial);
   if (group->entries.empty()) return;
   if (!openGroups_.empty()) {
     openGroups_.back()->entries.push_back(Group::Entry{{}, {}, std::move(group)});

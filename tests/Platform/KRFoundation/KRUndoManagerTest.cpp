@@ -332,6 +332,22 @@ TEST_F(KRUndoManagerTest, AnAutomaticGroupWithANestedGroupStillOpenClosesOnceTha
   expectTwoTurnsUndoneOneByOne(2);
 }
 
+TEST_F(KRUndoManagerTest, AnAutomaticGroupStaysOpenOverTurnsWhileAGroupInsideItIsOpen) {
+  undo_->setGroupsByEvent(true);
+  set(box_, 1);
+  undo_->beginUndoGrouping();
+  std::shared_ptr<KRRunLoop> loop = KRRunLoop::currentRunLoop();
+  for (int turn = 0; turn < 3; ++turn) {
+    bool ran = false;
+    loop->performBlock([&ran] { ran = true; });
+    EXPECT_TRUE(loop->runUntil([&ran] { return ran; }, KRDate::dateWithTimeIntervalSinceNow(5)));
+  }
+  EXPECT_EQ(undo_->groupingLevel(), 2);
+  undo_->endUndoGrouping();
+  EXPECT_TRUE(loop->runUntil([this] { return undo_->groupingLevel() == 0; },
+                             KRDate::dateWithTimeIntervalSinceNow(5)));
+}
+
 TEST_F(KRUndoManagerTest, UndoClosesAnOpenAutomaticGroupFirst) {
   undo_->setGroupsByEvent(true);
   set(box_, 1);
